@@ -1,0 +1,44 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <map>
+#include <memory>
+#include <vector>
+
+#include "ptc/IFactory.h"
+
+namespace PTC {
+
+class IRemoteReceiver;
+class ISender;
+
+/**
+ * Base of a process's object factory. Owns the remote receiver, the proxies and one sender per
+ * client module, and destroys them in this order: what sends goes before what it sends through.
+ */
+class InstanceFactory : public IInstanceFactory, public IAdapterFactory, public IProxyFactory {
+public:
+    InstanceFactory();
+    ~InstanceFactory() override;
+
+    bool initialize() override;
+    long getRRIdentity() override;
+
+    /** The sender of that module, or null. Stays owned by the factory. */
+    [[nodiscard]] ISender* findSender(long moduleId) const;
+
+    /** Takes ownership, unless the id is present already: then nothing happens. */
+    void addSender(ISender* sender);
+
+protected:
+    /** Keeps the proxy until the factory ends. */
+    void addProxy(std::unique_ptr<IProxyBase> proxy);
+
+    std::unique_ptr<IRemoteReceiver> mpRemoteReceiver;
+
+private:
+    std::vector<std::unique_ptr<IProxyBase>> mProxies;
+    std::map<long, std::unique_ptr<ISender>> mSenders;
+};
+
+} // namespace PTC

@@ -1,0 +1,52 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <atomic>
+#include <boost/thread/thread.hpp>
+#include <functional>
+#include <list>
+#include <string_view>
+
+#include "base/UniqueFd.h"
+#include "ptc/EventPacket.h"
+#include "ptc/RemoteReceiver.h"
+
+/**
+ * The server of the transport: listens on 127.0.0.1, acknowledges what it reads, and hands every
+ * complete packet to the receiver that the packet names.
+ *
+ * Threads: one listener, and one reader per connection. A connection's resources are released by
+ * the listener as soon as its reader has ended. The destructor stops and joins them all.
+ */
+class SocketRemoteReceiver : public PTC::RemoteReceiver {
+public:
+    using ErrorReporter = std::function<void(std::string_view line)>;
+
+    /** Errors go to standard output. */
+    explicit SocketRemoteReceiver(long id);
+    /** Errors go to `report`, which several threads may call. */
+    SocketRemoteReceiver(long id, ErrorReporter report);
+    ~SocketRemoteReceiver() override;
+
+    /** Binds port `identity` and starts listening. Add the receivers before. */
+    bool initialize(long identity) override;
+    void run() override;
+
+    /** Descriptor of the connection accepted last, -1 at first. */
+    [[nodiscard]] int getLastClientSocket() const;
+    [[nodiscard]] bool isRecvDataFailed(int result) const;
+    bool sendACK(int socket);
+
+    /** The listener's loop. */
+    int waitClientLink();
+    int addClientThread(int socket);
+
+    /** A reader's loop, on the connection accepted last. */
+    int ThreadMain();
+
+    /** Delivers the event of one complete packet. */
+    void executePacket(const char* buffer);
+
+private:
+    struct Connection;
+};
