@@ -13,7 +13,7 @@ struct _tagFileName {
 
 struct _tagSeekParam {
     int iClientID = -1;
-    int iSeekMode = 0; ///< 0 accurate, 1 nearest key frame, 2 relative
+    int iSeekMode = 0;  ///< 0 accurate, 1 nearest key frame, 2 relative
     long lPosition = 0; ///< nanoseconds
     bool bSeekOption = false;
 };
