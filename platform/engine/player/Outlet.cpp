@@ -1,0 +1,35 @@
+// SPDX-License-Identifier: MIT
+#include "player/Outlet.h"
+
+#include "gst/Barrier.h"
+
+namespace engine {
+
+void Outlet::setFunction(Function function) {
+    const std::lock_guard lock(mDelivery);
+    mFunction = std::move(function);
+}
+
+void Outlet::drain() {
+    const std::lock_guard lock(mDelivery);
+}
+
+void Outlet::deliver(std::uint64_t session, Notification notification) {
+    const std::lock_guard lock(mDelivery);
+    if (isCurrent(session))
+        call(notification);
+}
+
+void Outlet::deliverLast(std::uint64_t session, Notification notification) {
+    const std::lock_guard lock(mDelivery);
+    if (mSession.compare_exchange_strong(session, session + 1))
+        call(notification);
+}
+
+void Outlet::call(Notification& notification) const {
+    // A copy, because the function may set another one.
+    if (const Function function = mFunction)
+        gst::guarded([&] { function(notification); });
+}
+
+} // namespace engine

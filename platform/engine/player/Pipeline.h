@@ -1,0 +1,61 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <cstdint>
+#include <memory>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "gst/PadProbe.h"
+#include "gst/Types.h"
+#include "player/BusTap.h"
+#include "player/Items.h"
+#include "player/StatusClock.h"
+
+namespace engine {
+
+/**
+ * A pipeline that plays one medium, and the taps by which it tells of itself. For the engine's
+ * thread; its operations may take long, and in a broken library for ever.
+ */
+class Pipeline {
+public:
+    /** The sinks are those of `pipeline`; either may be empty. */
+    struct Parts {
+        gst::Element pipeline;
+        gst::Element videoSink;
+        gst::Element audioSink;
+    };
+
+    Pipeline(Parts parts, std::uint64_t number, const std::shared_ptr<EngineMailbox>& mailbox);
+    ~Pipeline();
+    Pipeline(const Pipeline&) = delete;
+    Pipeline& operator=(const Pipeline&) = delete;
+
+    [[nodiscard]] std::uint64_t number() const { return mNumber; }
+
+    GstStateChangeReturn setState(GstState state);
+    [[nodiscard]] GstState state() const;
+
+    /** `stop` nothing: to the end. False when the medium cannot. */
+    bool seek(GstSeekFlags flags, Nanoseconds start, std::optional<Nanoseconds> stop);
+
+    /** Of what reaches the sinks now; stands while the pipeline is paused. */
+    [[nodiscard]] ClockAnchor anchor() const;
+
+    [[nodiscard]] Nanoseconds duration() const; ///< 0 when unknown
+    [[nodiscard]] bool isSeekable() const;
+    void updateLatency();
+
+    /** The graph in Graphviz's dot format. */
+    [[nodiscard]] std::string graph() const;
+
+private:
+    const Parts mParts;
+    const std::uint64_t mNumber;
+    std::unique_ptr<BusTap> mpBusTap;
+    std::vector<gst::PadProbe> mProbes;
+};
+
+} // namespace engine

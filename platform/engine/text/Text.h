@@ -1,0 +1,15 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+#include <string_view>
+
+namespace engine {
+
+/**
+ * A file name or URI as the file system knows it: in the environment's character set, or, where
+ * that lacks a character, in UTF-8. Any thread; the process's locale is left alone.
+ */
+std::string toBytes(std::wstring_view text);
+
+} // namespace engine
