@@ -10,9 +10,13 @@ namespace PTC {
  */
 struct Event {
     /** The order of the arguments differs from the order of the fields. */
-    Event(long objectId, long methodId, void* data, long size, bool isRemote, bool isCallback)
-        : objectId(objectId), methodId(methodId), data(static_cast<char*>(data)),
-          isCallback(isCallback), size(size), isRemote(isRemote) {}
+    Event(long object, long method, void* block, long length, bool remote, bool callback)
+        : objectId(object),
+          methodId(method),
+          data(static_cast<char*>(block)),
+          isCallback(callback),
+          size(length),
+          isRemote(remote) {}
 
     long objectId;
     long methodId;

@@ -15,6 +15,12 @@ class ISender;
 /**
  * Base of a process's object factory. Owns the remote receiver, the proxies and one sender per
  * client module, and destroys them in this order: what sends goes before what it sends through.
+ *
+ * The threads behind the remote receiver call createProxy(). A factory whose createProxy() may
+ * run up to the end therefore resets mpRemoteReceiver in its own destructor: by the time that of
+ * this class runs, the overriding function is gone.
+ *
+ * Not locked: the senders and proxies belong to the thread that dispatches events.
  */
 class InstanceFactory : public IInstanceFactory, public IAdapterFactory, public IProxyFactory {
 public:

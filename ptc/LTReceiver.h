@@ -30,6 +30,9 @@ public:
     void loopProcessEvent();
 
 private:
+    void dispatchFront();
+    [[nodiscard]] PTC::Event* takeFront();
+
     std::atomic<bool> stopRequested{false};
     boost::interprocess::interprocess_mutex workerMutex; ///< held while the worker loops
     boost::interprocess::interprocess_mutex queueMutex;  ///< guards `queue`
