@@ -12,8 +12,10 @@ namespace qns {
  *
  * Both directions stop at the first NUL and at the first character that does not convert, and
  * return what was converted up to there. They follow the environment (LC_ALL, LC_CTYPE, LANG):
- * a change made with setenv(3) takes effect at the next call. The process's own locale is left
- * alone. Any thread may call them.
+ * a change made with setenv(3) takes effect at the next call. The first conversion also sets the
+ * process's own locale from the environment; later ones leave it alone.
+ *
+ * Any thread may call them, but, as with getenv(3), not while another changes the environment.
  */
 std::string narrow(std::wstring_view text);
 std::wstring widen(std::string_view text);
