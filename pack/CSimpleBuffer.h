@@ -28,9 +28,20 @@ public:
      * Extends the buffer by `count` bytes and returns where they start, or null (and changes
      * nothing) when memory is out. Growing adds `count` twice, or the minimum unit if larger.
      */
-    uint8_t* simplebuffer_checksize(simplebuffer* buffer, uint64_t count);
+    uint8_t* simplebuffer_checksize(simplebuffer* buffer, uint64_t count) {
+        uint64_t needed = 0;
+        const bool overflows = __builtin_add_overflow(buffer->size, count, &needed);
+        if (overflows || buffer->alloc < needed)
+            return grow(buffer, count);
+        uint8_t* const end = buffer->data + buffer->size;
+        buffer->size = needed;
+        return end;
+    }
 
-    /** Appends `count` bytes. 1 on success; 0, with nothing changed, when memory is out. */
+    /**
+     * Appends `count` bytes. 1 on success; 0, with nothing changed, when memory is out (and for
+     * no bytes at all to a buffer that has no memory yet).
+     */
     int simplebuffer_write(simplebuffer* buffer, const void* source, uint64_t count);
 
     /** Makes the buffer empty (null, 0) or lets it borrow `size` bytes of foreign memory. */
@@ -43,6 +54,8 @@ public:
     void simplebuffer_destroy(simplebuffer* buffer);
 
 private:
+    static uint8_t* grow(simplebuffer* buffer, uint64_t count);
+
     static uint64_t s_minimum_allocate_unit;
     static AllocateFunction s_allocate_function;
     static FreeFunction s_free_function;

@@ -20,8 +20,8 @@ enum unpack_type_t : int32_t {
 struct unpack_info_t {
     int32_t type;
     union {
-        uint64_t boolean;    ///< 0 or 1
-        int64_t signedInt;   ///< sign-extended
+        uint64_t boolean;     ///< 0 or 1
+        int64_t signedInt;    ///< sign-extended
         uint64_t unsignedInt; ///< zero-extended
         uint32_t floatBits;
         uint64_t doubleBits;
