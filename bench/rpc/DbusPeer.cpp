@@ -1,0 +1,112 @@
+// SPDX-License-Identifier: MIT
+#include "bench/rpc/DbusPeer.h"
+
+#include <array>
+#include <chrono>
+#include <cstdlib>
+#include <systemd/sd-bus.h>
+#include <thread>
+#include <unistd.h>
+
+#include "base/UniqueFd.h"
+
+namespace bench {
+namespace {
+
+constexpr const char* kName = "org.example.Bench";
+constexpr const char* kPath = "/org/example/bench";
+
+int answerStatus(sd_bus_message* message, void*, sd_bus_error*) {
+    int32_t clientId = 0;
+    sd_bus_message_read(message, "i", &clientId);
+    return sd_bus_reply_method_return(message, "iixx", 2, 0, int64_t{0}, int64_t{0});
+}
+
+// clang-format off
+const sd_bus_vtable kTable[] = {
+    SD_BUS_VTABLE_START(0),
+    SD_BUS_METHOD("Status", "i", "iixx", answerStatus, SD_BUS_VTABLE_UNPRIVILEGED),
+    SD_BUS_VTABLE_END
+};
+// clang-format on
+
+sd_bus* connectBus(const std::string& address) {
+    sd_bus* bus = nullptr;
+    if (sd_bus_new(&bus) < 0)
+        return nullptr;
+    if (sd_bus_set_address(bus, address.c_str()) < 0 || sd_bus_set_bus_client(bus, 1) < 0 ||
+        sd_bus_start(bus) < 0) {
+        sd_bus_unref(bus);
+        return nullptr;
+    }
+    return bus;
+}
+
+void serve(const std::string& address) {
+    sd_bus* bus = connectBus(address);
+    if (bus == nullptr)
+        return;
+    sd_bus_add_object_vtable(bus, nullptr, kPath, kName, kTable, nullptr);
+    sd_bus_request_name(bus, kName, 0);
+    for (;;) {
+        const int handled = sd_bus_process(bus, nullptr);
+        if (handled < 0)
+            return;
+        if (handled == 0)
+            sd_bus_wait(bus, UINT64_MAX);
+    }
+}
+
+std::string readLine(int fd) {
+    std::string line;
+    char byte;
+    while (::read(fd, &byte, 1) == 1 && byte != '\n')
+        line.push_back(byte);
+    return line;
+}
+
+} // namespace
+
+DbusPeer::DbusPeer() {
+    int ends[2];
+    if (::pipe(ends) != 0)
+        return;
+    const qns::UniqueFd readEnd(ends[0]);
+    {
+        const qns::UniqueFd writeEnd(ends[1]);
+        mBusDaemon = ChildProcess::run({"dbus-daemon", "--session", "--nofork", "--nopidfile",
+                                        "--address=unix:tmpdir=/tmp", "--print-address"},
+                                       writeEnd.get());
+    }
+    const std::string address = readLine(readEnd.get());
+    mService = ChildProcess::call([&] { serve(address); });
+    mpBus = connectBus(address);
+
+    const auto deadline = std::chrono::steady_clock::now() + std::chrono::seconds(10);
+    while (mpBus != nullptr && !call()) {
+        if (std::chrono::steady_clock::now() > deadline) {
+            mpBus = sd_bus_unref(mpBus);
+            return;
+        }
+        std::this_thread::sleep_for(std::chrono::milliseconds(5));
+    }
+}
+
+DbusPeer::~DbusPeer() {
+    sd_bus_flush_close_unref(mpBus);
+}
+
+bool DbusPeer::call() {
+    sd_bus_message* reply = nullptr;
+    int32_t status = 0;
+    int32_t reserved = 0;
+    int64_t position = 0;
+    int64_t duration = 0;
+    const bool answered =
+        sd_bus_call_method(mpBus, kName, kPath, kName, "Status", nullptr, &reply, "i", 1) >= 0 &&
+        sd_bus_message_read(reply, "iixx", &status, &reserved, &position, &duration) > 0;
+    sd_bus_message_unref(reply);
+    return answered && status == 2;
+}
+
+} // namespace bench

@@ -1,0 +1,43 @@
+// SPDX-License-Identifier: MIT
+#include "bench/rpc/RpcClient.h"
+
+#include <chrono>
+#include <thread>
+
+namespace bench {
+
+RpcClient::RpcClient(uint16_t servicePort, uint16_t ownPort)
+    : mListener(listenOn(ownPort)), mRequests(connectTo(servicePort)) {}
+
+bool RpcClient::awaitConnectionBack(const Packet* first) {
+    if (!mListener || !mRequests)
+        return false;
+    if (first != nullptr && !send(*first))
+        return false;
+    mReplies = acceptOne(mListener.get());
+    return static_cast<bool>(mReplies);
+}
+
+bool RpcClient::send(const Packet& request) {
+    return writePacket(mRequests.get(), request);
+}
+
+bool RpcClient::receive(Packet& reply) {
+    return readPacket(mReplies.get(), reply);
+}
+
+double RpcClient::pipeline(const Packet& request, int count) {
+    const auto start = std::chrono::steady_clock::now();
+    std::thread reader([&] {
+        Packet reply;
+        for (int i = 0; i < count; ++i)
+            receive(reply);
+    });
+    for (int i = 0; i < count; ++i)
+        send(request);
+    reader.join();
+    const std::chrono::duration<double> elapsed = std::chrono::steady_clock::now() - start;
+    return count / elapsed.count();
+}
+
+} // namespace bench

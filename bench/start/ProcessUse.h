@@ -1,0 +1,18 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <cstdint>
+#include <sys/types.h>
+
+namespace bench {
+
+/** What the kernel tells of a process. */
+struct ProcessUse {
+    double residentMegabytes = 0;
+    double cpuSeconds = 0;
+    int64_t contextSwitches = 0;
+};
+
+ProcessUse readProcessUse(pid_t pid);
+
+} // namespace bench
