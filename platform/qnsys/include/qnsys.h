@@ -16,10 +16,10 @@ extern "C" {
 
 #if defined(__GNUC__)
 #define QNSYS_API __attribute__((visibility("default")))
-#define QNSYS_PRINTF(format, arguments) __attribute__((format(printf, format, arguments)))
+#define QNSYS_PRINTF(text, first) __attribute__((format(printf, text, first)))
 #else
 #define QNSYS_API
-#define QNSYS_PRINTF(format, arguments)
+#define QNSYS_PRINTF(text, first)
 #endif
 
 /** Prepares the library. May be called more than once. Negative on failure. */
