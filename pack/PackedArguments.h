@@ -19,7 +19,12 @@
  */
 class PackedArguments {
 public:
-    PackedArguments() { CSimpleBuffer().simplebuffer_init(&mBuffer, nullptr, 0); }
+    PackedArguments() {
+        CSimpleBuffer().simplebuffer_init(&mBuffer, nullptr, 0);
+        // Room for nearly every reply and notification at once; the buffer grows for the rest.
+        CSimpleBuffer().simplebuffer_checksize(&mBuffer, kFirstRoom);
+        mBuffer.size = 0;
+    }
     ~PackedArguments() { CSimpleBuffer().simplebuffer_destroy(&mBuffer); }
     PackedArguments(PackedArguments&& other) noexcept
         : mBuffer(std::exchange(other.mBuffer, simplebuffer{})) {}
@@ -63,11 +68,13 @@ public:
     /** For the encoders themselves. The memory stays owned by this object. */
     [[nodiscard]] simplebuffer* get() { return &mBuffer; }
 
-    /** Null while nothing is packed. Valid until the next value is added. */
+    /** Valid until the next value is added. */
     [[nodiscard]] uint8_t* data() { return mBuffer.data; }
     [[nodiscard]] const uint8_t* data() const { return mBuffer.data; }
     [[nodiscard]] uint64_t size() const { return mBuffer.size; }
 
 private:
+    static constexpr uint64_t kFirstRoom = 128;
+
     simplebuffer mBuffer;
 };

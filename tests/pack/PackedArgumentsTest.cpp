@@ -16,7 +16,21 @@ Bytes bytesOf(const PackedArguments& arguments) {
 
 TEST(PackedArguments, IsEmptyWithoutValues) {
     const PackedArguments arguments;
-    EXPECT_EQ(arguments.data(), nullptr);
+    EXPECT_EQ(arguments.size(), 0u);
+}
+
+TEST(PackedArguments, AllocatesOnceForAnOrdinaryBlock) {
+    const CountedAllocation policy;
+    PackedArguments arguments;
+    arguments.int32(1).text(std::wstring(100, L'x')).uint64(2).uint64(3).int64(4);
+    EXPECT_EQ(CountedAllocation::allocations(), 1);
+}
+
+TEST(PackedArguments, WithoutMemoryValuesAreLeftOut) {
+    const CountedAllocation policy;
+    CountedAllocation::fail(true);
+    PackedArguments arguments;
+    arguments.int32(1).text(L"text");
     EXPECT_EQ(arguments.size(), 0u);
 }
 
