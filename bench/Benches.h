@@ -1,0 +1,20 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+#include <vector>
+
+namespace bench {
+
+class Report;
+
+/** What every subcommand is started with. */
+struct Options {
+    int rounds = 0;                     ///< how often to repeat; 0: as the subcommand likes
+    std::vector<std::string> arguments; ///< the subcommand's own
+};
+
+/** The subcommands. Each adds its rows to the report and returns the exit status. */
+int runPack(const Options& options, Report& report);
+
+} // namespace bench

@@ -1,0 +1,77 @@
+// SPDX-License-Identifier: MIT
+#include "bench/Benches.h"
+#include "bench/Report.h"
+
+#include <CLI/CLI.hpp>
+#include <cstdio>
+#include <iostream>
+#include <sched.h>
+
+namespace {
+
+struct Bench {
+    const char* name;
+    const char* summary;
+    int (*run)(const bench::Options& options, bench::Report& report);
+};
+
+constexpr Bench kBenches[] = {
+    {"pack", "encode and decode every value form, beside msgpack-c", bench::runPack},
+};
+
+struct CommonOptions {
+    bench::Options bench;
+    bool json = false;
+    int core = -1;
+};
+
+bool pinTo(int core) {
+    cpu_set_t cores;
+    CPU_ZERO(&cores);
+    CPU_SET(static_cast<unsigned>(core), &cores);
+    if (::sched_setaffinity(0, sizeof cores, &cores) == 0)
+        return true;
+    std::perror("qnsmedia-bench: cannot pin to the core");
+    return false;
+}
+
+int run(const Bench& bench, const CommonOptions& options) {
+    if (options.core >= 0 && !pinTo(options.core))
+        return 1;
+    bench::Report report;
+    const int status = bench.run(options.bench, report);
+    if (options.json)
+        report.printJson(std::cout);
+    else
+        report.printTable(std::cout);
+    return status;
+}
+
+void addCommonOptions(CLI::App& command, CommonOptions& options) {
+    command.add_flag("--json", options.json, "print the figures as JSON");
+    command.add_option("--core", options.core, "run on this processor core only")
+        ->check(CLI::Range(0, CPU_SETSIZE - 1));
+    command.add_option("--rounds", options.bench.rounds, "how often to repeat each measurement")
+        ->check(CLI::PositiveNumber);
+    command.allow_extras();
+}
+
+} // namespace
+
+int main(int argc, char** argv) {
+    CLI::App app("Measurements of QNSMediaService beside its peers", "qnsmedia-bench");
+    app.require_subcommand(1);
+    CommonOptions options;
+    for (const Bench& bench : kBenches)
+        addCommonOptions(*app.add_subcommand(bench.name, bench.summary), options);
+    CLI11_PARSE(app, argc, argv);
+
+    for (const Bench& bench : kBenches) {
+        const CLI::App& command = *app.get_subcommand(bench.name);
+        if (!command.parsed())
+            continue;
+        options.bench.arguments = command.remaining();
+        return run(bench, options);
+    }
+    return 1;
+}
