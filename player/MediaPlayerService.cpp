@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: MIT
 #include "player/MediaPlayerService.h"
 
+#include <utility>
+
 #include <QCoreApplication>
 
 #include "base/StandardOutput.h"
@@ -10,7 +12,7 @@
 
 /** What is peculiar to one kind of request. */
 struct PlayerRequest {
-    const char* name;
+    const char* name; ///< of the operation
     void (MediaPlayerService::*signal)();
     void (IMediaPlayerServiceCallBack::*answer)(int);
     int accepted;   ///< the answer to a registered client
@@ -20,45 +22,20 @@ struct PlayerRequest {
 
 namespace {
 
-using Service = MediaPlayerService;
-using CallBack = IMediaPlayerServiceCallBack;
+using S = MediaPlayerService;
+using C = IMediaPlayerServiceCallBack;
 
-constexpr PlayerRequest kInitialize{"MediaPlayerService::initializePlayer",
-                                    &Service::initialize_signal,
-                                    &CallBack::initializePlayerCallBack,
-                                    0,
-                                    1,
-                                    true};
-constexpr PlayerRequest kOpen{"MediaPlayerService::openPlayer",
-                              &Service::open_signal,
-                              &CallBack::openPlayerCallBack,
-                              0,
-                              1,
-                              true};
-constexpr PlayerRequest kOpenNothing{"MediaPlayerService::openPlayer",
-                                     &Service::close_signal,
-                                     &CallBack::openPlayerCallBack,
-                                     1,
-                                     1,
-                                     true};
-constexpr PlayerRequest kClose{"MediaPlayerService::closePlayer",
-                               &Service::close_signal,
-                               &CallBack::closePlayerCallBack,
-                               0,
-                               1,
-                               true};
-constexpr PlayerRequest kPlay{
-    "MediaPlayerService::play", &Service::play_signal, &CallBack::playCallBack, 0, 1, false};
-constexpr PlayerRequest kPause{
-    "MediaPlayerService::pause", &Service::pause_signal, &CallBack::pauseCallBack, 0, 0, false};
-constexpr PlayerRequest kSeek{
-    "MediaPlayerService::seek", &Service::seek_signal, &CallBack::seekCallBack, 0, 1, false};
-constexpr PlayerRequest kSetRepeat{"MediaPlayerService::setRepeat",
-                                   &Service::setRepeat_signal,
-                                   &CallBack::setRepeatCallBack,
-                                   0,
-                                   1,
-                                   false};
+// clang-format off
+constexpr PlayerRequest
+    kInitialize{"initializePlayer", &S::initialize_signal, &C::initializePlayerCallBack, 0, 1, true},
+    kOpen      {"openPlayer",       &S::open_signal,       &C::openPlayerCallBack,       0, 1, true},
+    kOpenEmpty {"openPlayer",       &S::close_signal,      &C::openPlayerCallBack,       1, 1, true},
+    kClose     {"closePlayer",      &S::close_signal,      &C::closePlayerCallBack,      0, 1, true},
+    kPlay      {"play",             &S::play_signal,       &C::playCallBack,             0, 1, false},
+    kPause     {"pause",            &S::pause_signal,      &C::pauseCallBack,            0, 0, false},
+    kSeek      {"seek",             &S::seek_signal,       &C::seekCallBack,             0, 1, false},
+    kSetRepeat {"setRepeat",        &S::setRepeat_signal,  &C::setRepeatCallBack,        0, 1, false};
+// clang-format on
 
 constexpr char kModule[] = "MediaPlayerService";
 constexpr int kInformation = 6;
@@ -69,11 +46,14 @@ constexpr int kFormat50Hz = 3;
 
 constexpr MediaServiceDefine::_tagMediaPlayerStatus kNotReady{2, 0, 0, 0};
 
+std::unique_ptr<MediaPlayerController> makeController() {
+    INIT_LOGGING(L"MediaPlayerService");
+    return std::make_unique<MediaPlayerController>();
+}
+
 } // namespace
 
-MediaPlayerService::MediaPlayerService()
-    : mpMediaPlayerController(
-          (INIT_LOGGING(L"MediaPlayerService"), std::make_unique<MediaPlayerController>())) {
+MediaPlayerService::MediaPlayerService() : mpMediaPlayerController(makeController()) {
     connectController();
 }
 
@@ -102,7 +82,7 @@ void MediaPlayerService::initializePlayer(int iClientID) {
 
 void MediaPlayerService::openPlayer(MediaServiceDefine::_tagFileName fileName) {
     if (fileName.strFileName.empty())
-        return handle(kOpenNothing, fileName.iClientID);
+        return handle(kOpenEmpty, fileName.iClientID);
     handle(kOpen, fileName.iClientID,
            [&] { mpMediaPlayerController->setFileName(std::move(fileName.strFileName)); });
 }
@@ -129,8 +109,8 @@ void MediaPlayerService::setRepeat(MediaServiceDefine::_tagRepeatParam param) {
 
 template<typename Store>
 void MediaPlayerService::handle(const PlayerRequest& request, int iClientID, Store store) {
-    qns::printLine(request.name);
-    CallBack* const callback = callbackOf(iClientID);
+    qns::printFormatted("MediaPlayerService::%s\n", request.name);
+    auto* const callback = callbackOf(iClientID);
     const bool accepted = isEnableID(iClientID);
     if (accepted) {
         store();
@@ -155,7 +135,7 @@ void MediaPlayerService::emitSignal(void (MediaPlayerService::*signal)()) {
 }
 
 void MediaPlayerService::getPlayerStatus(int iClientID) {
-    CallBack* const callback = callbackOf(iClientID);
+    auto* const callback = callbackOf(iClientID);
     if (isEnableID(iClientID) && mbPlayerReady) {
         mpMediaPlayerController->setStatusClientID(iClientID);
         emitSignal(&MediaPlayerService::getStatus_signal);
@@ -166,7 +146,7 @@ void MediaPlayerService::getPlayerStatus(int iClientID) {
 
 void MediaPlayerService::retPlayerStatus() {
     const auto [iClientID, status] = mpMediaPlayerController->statusAnswer();
-    if (CallBack* const callback = callbackOf(iClientID))
+    if (auto* const callback = callbackOf(iClientID))
         callback->getPlayerStatusCallBack(status);
 }
 
@@ -184,7 +164,7 @@ void MediaPlayerService::powerOffMediaPlayer(int iClientID) {
                               Qt::QueuedConnection);
     LOG_EVENT(kInformation, kModule, 901,
               "MediaPlayerService::powerOffMediaPlayer() : QApplication::quit() finished.");
-    if (CallBack* const callback = callbackOf(iClientID)) {
+    if (auto* const callback = callbackOf(iClientID)) {
         LOG_EVENT(kInformation, kModule, 902,
                   "MediaPlayerService::powerOffMediaPlayer() : calling the callback func.");
         callback->powerOffMediaPlayerCallBack();

@@ -5,11 +5,11 @@
 #include <string>
 #include <thread>
 
+#include "player/MediaPlayerController.h"
 #include "tests/player/OutputCapture.h"
 #include "tests/player/PlayerFixture.h"
 
 using testing::Each;
-using testing::ElementsAre;
 using testing::SizeIs;
 
 namespace {
@@ -99,4 +99,37 @@ TEST_F(PlayerThreads, NotificationsArePassedOnUntilThePlayerHasEnded) {
     mAdapter.reset();
     output.text();
     EXPECT_THAT(mSender.take(), SizeIs(kThreads * kRounds));
+}
+
+TEST_F(PlayerThreads, EveryParameterMayBeSetWhileASlotReadsIt) {
+    engineFactory().next = new Player;
+    MediaPlayerController controller;
+    const auto together = [](auto set, auto read) {
+        std::promise<void> started;
+        std::thread writer([&] {
+            started.set_value();
+            for (int value = 0; value < 20 * kRounds; ++value)
+                set(value);
+        });
+        started.get_future().wait();
+        for (int i = 0; i < 20 * kRounds; ++i)
+            read();
+        writer.join();
+    };
+    OutputCapture output;
+    together([&](int value) { controller.setFileName(std::to_wstring(value)); },
+             [&] { controller.open(); });
+    together([&](int value) { controller.setFormat(value); }, [&] { controller.open(); });
+    together(
+        [&](int value) {
+            controller.setSeekParam({1, value, value, false});
+        },
+        [&] { controller.seek(); });
+    together(
+        [&](int value) {
+            controller.setRepeatParam({1, true, value, value});
+        },
+        [&] { controller.setRepeat(); });
+    together([&](int value) { controller.setStatusClientID(value); },
+             [&] { static_cast<void>(controller.statusAnswer()); });
 }
