@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: MIT
 #include "ptc/Adapter.h"
 
-#include <cassert>
-
 #include "ptc/IFactory.h"
+
+#include <cassert>
 
 namespace PTC {
 

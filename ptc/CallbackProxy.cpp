@@ -1,10 +1,10 @@
 // SPDX-License-Identifier: MIT
 #include "ptc/CallbackProxy.h"
 
-#include <cassert>
-
 #include "ptc/Event.h"
 #include "ptc/ISender.h"
+
+#include <cassert>
 
 namespace PTC {
 

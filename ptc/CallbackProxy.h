@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <cstdint>
-
 #include "ptc/IProxy.h"
+
+#include <cstdint>
 
 namespace PTC {
 

@@ -1,10 +1,10 @@
 // SPDX-License-Identifier: MIT
 #include "ptc/CallbackReply.h"
 
-#include <utility>
-
 #include "pack/PackedArguments.h"
 #include "ptc/CallbackProxy.h"
+
+#include <utility>
 
 namespace PTC {
 

@@ -1,11 +1,11 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include "ptc/Event.h"
+
 #include <cstddef>
 #include <memory>
 #include <vector>
-
-#include "ptc/Event.h"
 
 namespace PTC {
 

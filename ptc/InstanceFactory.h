@@ -1,11 +1,11 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include "ptc/IFactory.h"
+
 #include <map>
 #include <memory>
 #include <vector>
-
-#include "ptc/IFactory.h"
 
 namespace PTC {
 

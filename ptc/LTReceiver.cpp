@@ -1,31 +1,19 @@
 // SPDX-License-Identifier: MIT
 #include "ptc/LTReceiver.h"
 
-#include <algorithm>
+#include "ptc/Barrier.h"
+#include "ptc/SemaphoreWait.h"
+
 #include <boost/interprocess/exceptions.hpp>
 #include <boost/interprocess/sync/scoped_lock.hpp>
-#include <cassert>
-#include <cerrno>
-#include <memory>
 
-#include "ptc/Barrier.h"
+#include <algorithm>
+#include <cassert>
+#include <memory>
 
 namespace {
 
 using Lock = boost::interprocess::scoped_lock<boost::interprocess::interprocess_mutex>;
-
-/** A signal handler that ran on the waiting thread is no reason to stop working. */
-void waitThroughSignals(boost::interprocess::interprocess_semaphore& semaphore) {
-    for (;;) {
-        try {
-            semaphore.wait();
-            return;
-        } catch (const boost::interprocess::interprocess_exception& error) {
-            if (error.get_native_error() != EINTR)
-                throw;
-        }
-    }
-}
 
 } // namespace
 
@@ -67,7 +55,8 @@ void LTReceiver::processEvent() {
 void LTReceiver::loopProcessEvent() {
     const Lock working(workerMutex);
     for (;;) {
-        waitThroughSignals(queueSemaphore);
+        // A signal handler that ran on this thread is no reason to stop working.
+        PTC::waitThroughSignals(queueSemaphore);
         while (!stopRequested && !isQueueEmpty())
             dispatchFront();
         if (stopRequested)

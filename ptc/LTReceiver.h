@@ -1,13 +1,14 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <atomic>
+#include "ptc/Receiver.h"
+
 #include <boost/interprocess/sync/interprocess_mutex.hpp>
 #include <boost/interprocess/sync/interprocess_semaphore.hpp>
 #include <boost/thread/thread.hpp>
-#include <deque>
 
-#include "ptc/Receiver.h"
+#include <atomic>
+#include <deque>
 
 /**
  * Dispatches events on one worker thread of its own, one at a time and in the order in which

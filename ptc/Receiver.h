@@ -1,10 +1,10 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include "ptc/IReceiver.h"
+
 #include <map>
 #include <memory>
-
-#include "ptc/IReceiver.h"
 
 namespace PTC {
 

@@ -1,14 +1,14 @@
 // SPDX-License-Identifier: MIT
 #include "ptc/Registration.h"
 
+#include "define/RegistrationInfo.h"
+#include "pack/ArgumentReader.h"
+#include "ptc/Event.h"
+
 #include <cstddef>
 #include <cstdint>
 #include <cstring>
 #include <utility>
-
-#include "define/RegistrationInfo.h"
-#include "pack/ArgumentReader.h"
-#include "ptc/Event.h"
 
 namespace PTC {
 

@@ -1,10 +1,10 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include "ptc/IRemoteReceiver.h"
+
 #include <map>
 #include <memory>
-
-#include "ptc/IRemoteReceiver.h"
 
 namespace PTC {
 

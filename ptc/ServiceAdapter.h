@@ -1,18 +1,18 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include "pack/ArgumentReader.h"
+#include "ptc/Adapter.h"
+#include "ptc/Event.h"
+#include "ptc/IProxy.h"
+#include "ptc/Registration.h"
+
 #include <algorithm>
 #include <cstddef>
 #include <iterator>
 #include <memory>
 #include <type_traits>
 #include <utility>
-
-#include "pack/ArgumentReader.h"
-#include "ptc/Adapter.h"
-#include "ptc/Event.h"
-#include "ptc/IProxy.h"
-#include "ptc/Registration.h"
 
 namespace PTC {
 

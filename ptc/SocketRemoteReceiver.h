@@ -1,15 +1,18 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <atomic>
-#include <boost/thread/thread.hpp>
-#include <functional>
-#include <list>
-#include <string_view>
-
 #include "base/UniqueFd.h"
 #include "ptc/EventPacket.h"
 #include "ptc/RemoteReceiver.h"
+
+#include <boost/interprocess/sync/interprocess_semaphore.hpp>
+#include <boost/thread/thread.hpp>
+
+#include <atomic>
+#include <chrono>
+#include <functional>
+#include <list>
+#include <string_view>
 
 /**
  * The server of the transport: listens on 127.0.0.1, acknowledges what it reads, and hands every
@@ -48,5 +51,34 @@ public:
     void executePacket(const char* buffer);
 
 private:
-    struct Connection;
+    /** One accepted client. Its descriptor is open until its reader has been joined. */
+    struct Connection {
+        qns::UniqueFd socket;
+        std::atomic<bool> ended{false}; ///< set by the reader as the last thing
+        boost::thread reader;
+    };
+
+    [[nodiscard]] const char* openServerSocket();
+    void stopListener();
+    void stopReaders();
+
+    void acceptNext();
+    void handleFailedAccept(int error);
+    void pause(std::chrono::milliseconds time);
+    void waitForWork(bool alsoForClients, std::chrono::milliseconds time);
+    void releaseEndedConnections();
+
+    void readUntilEnd(Connection& connection);
+    [[nodiscard]] bool readPacket(int socket, char* buffer);
+    void wakeListener();
+    void report(std::string_view line);
+
+    const ErrorReporter mReport;
+    qns::UniqueFd serverSocket;
+    qns::UniqueFd mWakeUp; ///< eventfd that wakes the listener: stop, or a reader has ended
+    std::atomic<bool> mStopping{false};
+    std::atomic<int> lastClientSocket{-1};
+    boost::interprocess::interprocess_semaphore mSocketTaken{0}; ///< by the newest reader
+    std::list<Connection> mConnections; ///< the listener's; the destructor's once that has ended
+    boost::thread listenerThread;
 };

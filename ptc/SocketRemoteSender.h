@@ -1,12 +1,14 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <array>
-#include <mutex>
-
 #include "base/UniqueFd.h"
 #include "ptc/EventPacket.h"
 #include "ptc/RemoteSender.h"
+
+#include <array>
+#include <atomic>
+#include <cstddef>
+#include <mutex>
 
 /**
  * Sends events to a process of this machine, one packet each. Any thread may call send().
@@ -19,6 +21,7 @@ class SocketRemoteSender : public PTC::RemoteSender {
 public:
     /** `moduleId` is the id of the receiver in the other process. */
     explicit SocketRemoteSender(long moduleId);
+    ~SocketRemoteSender() override;
 
     /** Connects to 127.0.0.1, port `identity`. */
     bool initialize(long identity) override;
@@ -32,8 +35,14 @@ public:
     [[nodiscard]] int socket() const { return clientSocket.get(); }
 
 private:
+    void fillPacket(const PTC::Event& event);
+    bool drainAcknowledgements();
+    [[nodiscard]] bool writePacket();
+    void giveUp();
+
     qns::UniqueFd clientSocket;
-    std::mutex mSendMutex; ///< guards all below and the order of bytes on the socket
-    bool mGivenUp = false;
-    std::array<char, PTC::kPacketSize> mPacket{}; ///< zero beyond the bytes last used
+    std::atomic<bool> mGivenUp{false}; ///< read before locking: nobody queues up for a lost peer
+    std::mutex mSendMutex;             ///< guards all below and the order of bytes on the socket
+    std::size_t mUsed = 0;             ///< length of the header and payload that `mPacket` holds
+    std::array<char, PTC::kPacketSize> mPacket{}; ///< zero beyond the bytes in use
 };
