@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: MIT
 #include "pack/ArgumentReader.h"
 
+#include <cstring>
+
 ArgumentReader::ArgumentReader(const void* data, long size)
     : mpNext(static_cast<const uint8_t*>(data)),
       mLeft(data != nullptr && size > 0 ? static_cast<std::size_t>(size) : 0) {}
@@ -8,6 +10,13 @@ ArgumentReader::ArgumentReader(const void* data, long size)
 void ArgumentReader::read(std::wstring& field) {
     if (decodeNext() && mInfo.type == UNPACK_RAW)
         field = s2ws(mInfo.ptr, mInfo.value.rawLength);
+}
+
+void ArgumentReader::read(std::string& field) {
+    if (!decodeNext() || mInfo.type != UNPACK_RAW)
+        return;
+    const auto* text = reinterpret_cast<const char*>(mInfo.ptr);
+    field.assign(text, ::strnlen(text, mInfo.value.rawLength));
 }
 
 bool ArgumentReader::decodeNext() {

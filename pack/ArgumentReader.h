@@ -37,6 +37,8 @@ public:
             field = static_cast<T>(mInfo.value.unsignedInt);
     }
     void read(std::wstring& field);
+    /** The raw's bytes as they are. */
+    void read(std::string& field);
 
 private:
     /** False when the field keeps its preset. */
