@@ -1,0 +1,51 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <memory>
+
+#include "ptc/InstanceFactory.h"
+
+class IMediaPlayerService;
+class LTReceiver;
+
+/** The C heap, as the encoding layer's buffers take it. */
+void* myMalloc(unsigned long size);
+void myFree(void* memory);
+
+/**
+ * Builds the whole serving side at start-up, and makes the proxies through which services talk
+ * back to clients. initialize() runs on the main thread, createProxy() on the receiver's worker.
+ */
+class MediaServiceFactory : public PTC::InstanceFactory {
+public:
+    MediaServiceFactory();
+    ~MediaServiceFactory() override;
+
+    /** Builds receiver, services, adapters and server. False when the server could not start. */
+    bool initialize() override;
+
+    /** No objects are made by id here. */
+    void createInstance(long id, void** instance) override;
+
+    /** Puts `service` in the place of the one that initialize() would make. Takes ownership. */
+    virtual void RegisterObject(long id, void* service);
+
+    /** Adapters are made in initialize() only: null. */
+    void* createAdapter(long id, PTC::IReceiver* receiver, void* target) override;
+
+    /**
+     * A proxy of interface `interfaceId` for object `proxyId` of the client at port
+     * `clientIdentity`, connecting to the client when its module has no sender yet. Null for an
+     * unknown interface, and when the client cannot be reached. The factory owns the proxy.
+     */
+    PTC::IProxyBase* createProxy(long interfaceId, long proxyId, long clientIdentity) override;
+
+private:
+    void addPlayer();
+    bool startServer();
+    PTC::ISender* senderFor(long clientIdentity);
+
+    IMediaPlayerService* mpPlayerService = nullptr; ///< its adapter owns it once there is one
+    LTReceiver* mpThreadedReceiver = nullptr;       ///< owned by one of the next two
+    std::unique_ptr<LTReceiver> mpIdleReceiver;     ///< while no server runs
+};
