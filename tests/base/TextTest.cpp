@@ -203,20 +203,6 @@ TEST(TextDeathTest, TheFirstConversionSetsTheProcessLocaleAndLaterOnesDoNot) {
     EXPECT_EXIT(body(), ::testing::ExitedWithCode(0), "");
 }
 
-TEST(TextDeathTest, WithoutAnEnvironmentOnlyAsciiConverts) {
-    ::testing::FLAGS_gtest_death_test_style = "threadsafe";
-    const auto body = [] {
-        const Variable locale("LC_ALL", "C.UTF-8");
-        const bool before = narrow(L"a\u00e9") == "a\xC3\xA9";
-        ::clearenv();
-        const bool without = narrow(L"a\u00e9") == "a" && widen("a\xC3\xA9") == L"a";
-        ::setenv("LC_ALL", "C.UTF-8", 1);
-        const bool again = narrow(L"a\u00e9") == "a\xC3\xA9";
-        std::_Exit(before && without && again ? 0 : 1);
-    };
-    EXPECT_EXIT(body(), ::testing::ExitedWithCode(0), "");
-}
-
 TEST(Text, EightThreadsConvertAtOnceWhileTheLocaleIsFirstLoaded) {
     for (const char* name : {"C.UTF-8", "C", "C.UTF-8"}) {
         const Variable locale("LC_ALL", name);

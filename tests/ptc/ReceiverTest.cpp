@@ -1,11 +1,11 @@
 // SPDX-License-Identifier: MIT
 #include "ptc/Receiver.h"
 
-#include "tests/ptc/TestAdapter.h"
+#include <stdexcept>
 
 #include <gtest/gtest.h>
 
-#include <stdexcept>
+#include "tests/ptc/TestAdapter.h"
 
 using PTC::Receiver;
 

@@ -1,0 +1,138 @@
+// SPDX-License-Identifier: MIT
+#include "main/SignalHandler.h"
+
+#include <array>
+#include <csignal>
+#include <gmock/gmock.h>
+#include <string>
+#include <sys/resource.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include "qnsys.h"
+
+using ::testing::HasSubstr;
+
+namespace {
+
+struct Outcome {
+    int status = 0;
+    std::string output; ///< what the child wrote to standard output and error
+};
+
+/** Runs `body` in a child process, where signals can do what they do. */
+template<typename Body>
+Outcome inChild(Body&& body) {
+    std::array<int, 2> ends{};
+    EXPECT_EQ(::pipe(ends.data()), 0);
+    const pid_t child = ::fork();
+    if (child == 0) {
+        const rlimit noCore{};
+        ::setrlimit(RLIMIT_CORE, &noCore);
+        ::dup2(ends[1], STDOUT_FILENO);
+        ::dup2(ends[1], STDERR_FILENO);
+        ::close(ends[0]);
+        ::close(ends[1]);
+        qnsys_init();
+        body();
+        ::_exit(0);
+    }
+    ::close(ends[1]);
+    Outcome outcome;
+    std::array<char, 4096> buffer{};
+    for (ssize_t count; (count = ::read(ends[0], buffer.data(), buffer.size())) > 0;)
+        outcome.output.append(buffer.data(), static_cast<std::size_t>(count));
+    ::close(ends[0]);
+    ::waitpid(child, &outcome.status, 0);
+    return outcome;
+}
+
+void exitWithSeven() {
+    ::_exit(7);
+}
+
+void exitWithEight() {
+    ::_exit(8);
+}
+
+[[noreturn]] void waitForTheEnd() {
+    for (;;)
+        ::pause();
+}
+
+class IgnoredSignals : public ::testing::TestWithParam<int> {};
+
+TEST_P(IgnoredSignals, DoNotEndTheProcess) {
+    const Outcome outcome = inChild([] {
+        registerSystemSignalHandler(exitWithSeven, "test");
+        ::raise(GetParam());
+    });
+    EXPECT_TRUE(WIFEXITED(outcome.status));
+    EXPECT_EQ(WEXITSTATUS(outcome.status), 0);
+}
+
+INSTANTIATE_TEST_SUITE_P(All, IgnoredSignals,
+                         ::testing::Values(SIGPIPE, SIGUSR1, SIGUSR2, SIGALRM, SIGPWR));
+
+class EndingSignals : public ::testing::TestWithParam<int> {};
+
+TEST_P(EndingSignals, RunTheCallback) {
+    const Outcome outcome = inChild([] {
+        registerSystemSignalHandler(exitWithSeven, "test");
+        ::raise(GetParam());
+        waitForTheEnd();
+    });
+    EXPECT_TRUE(WIFEXITED(outcome.status));
+    EXPECT_EQ(WEXITSTATUS(outcome.status), 7);
+}
+
+TEST_P(EndingSignals, RunTheCallbackThatWasRegisteredLast) {
+    const Outcome outcome = inChild([] {
+        registerSystemSignalHandler(exitWithSeven, "test");
+        registerSystemSignalHandler(exitWithEight, "test");
+        ::raise(GetParam());
+        waitForTheEnd();
+    });
+    EXPECT_EQ(WEXITSTATUS(outcome.status), 8);
+}
+
+TEST_P(EndingSignals, DoNothingWithoutACallback) {
+    const Outcome outcome = inChild([] {
+        registerSystemSignalHandler(nullptr, "test");
+        ::raise(GetParam());
+        // A callback registered now is told of the next signal only.
+        registerSystemSignalHandler(exitWithSeven, "test");
+        ::raise(GetParam());
+        waitForTheEnd();
+    });
+    EXPECT_TRUE(WIFEXITED(outcome.status));
+    EXPECT_EQ(WEXITSTATUS(outcome.status), 7);
+}
+
+INSTANTIATE_TEST_SUITE_P(All, EndingSignals, ::testing::Values(SIGINT, SIGTERM));
+
+class CrashSignals : public ::testing::TestWithParam<int> {};
+
+TEST_P(CrashSignals, PrintABackTraceAndAbort) {
+    const Outcome outcome = inChild([] {
+        registerSystemSignalHandler(exitWithSeven, "test");
+        ::raise(GetParam());
+    });
+    EXPECT_TRUE(WIFSIGNALED(outcome.status));
+    EXPECT_EQ(WTERMSIG(outcome.status), SIGABRT);
+    EXPECT_THAT(outcome.output, HasSubstr("main_test"));
+    EXPECT_THAT(outcome.output, HasSubstr("raise"));
+}
+
+INSTANTIATE_TEST_SUITE_P(All, CrashSignals, ::testing::Values(SIGSEGV, SIGBUS, SIGFPE, SIGQUIT));
+
+TEST(SignalHandler, LeavesSignalsBeyondItsTableAlone) {
+    const Outcome outcome = inChild([] {
+        registerSystemSignalHandler(exitWithSeven, "test");
+        ::raise(SIGXCPU);
+    });
+    EXPECT_TRUE(WIFSIGNALED(outcome.status));
+    EXPECT_EQ(WTERMSIG(outcome.status), SIGXCPU);
+}
+
+} // namespace
