@@ -17,6 +17,9 @@ struct Bench {
 
 constexpr Bench kBenches[] = {
     {"pack", "encode and decode every value form, beside msgpack-c", bench::runPack},
+    {"rpc", "one request and its answer, beside bare sockets and D-Bus", bench::runRpc},
+    {"start", "start-up, memory and idle load, beside an empty QApplication and MPD",
+     bench::runStart},
 };
 
 struct CommonOptions {

@@ -7,6 +7,7 @@
 
 #include "LibMediaPlayer/IMediaPlayer.h"
 #include "LibMediaPlayer/InterfaceFactory.h"
+#include "LibMediaPlayer/Result.h"
 
 namespace LibMediaPlayer {
 namespace {

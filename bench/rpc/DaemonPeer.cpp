@@ -23,12 +23,11 @@ Packet makeRequest(PlayerMethod method, const PackedArguments& arguments) {
     header.receiverId = MediaServiceDefine::kThreadedReceiverId;
     header.objectId = MediaServiceDefine::kPlayerAdapterId;
     header.methodId = static_cast<long>(method);
-    header.size = arguments.size();
+    header.size = static_cast<long>(arguments.size());
     header.isRemote = 1;
     Packet packet{};
     std::memcpy(packet.data(), &header, sizeof header);
-    std::memcpy(packet.data() + sizeof header, arguments.data(),
-                static_cast<std::size_t>(arguments.size()));
+    std::memcpy(packet.data() + sizeof header, arguments.data(), arguments.size());
     return packet;
 }
 

@@ -1,9 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include "bench/rpc/DbusPeer.h"
 
-#include <array>
 #include <chrono>
-#include <cstdlib>
 #include <systemd/sd-bus.h>
 #include <thread>
 #include <unistd.h>
