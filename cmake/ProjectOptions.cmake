@@ -42,6 +42,9 @@ function(qns_add_folder name)
     add_library(qns_${name} STATIC ${arg_SOURCES})
     target_include_directories(qns_${name} PUBLIC "${PROJECT_SOURCE_DIR}")
     target_link_libraries(qns_${name} PUBLIC ${arg_LINKS})
+    # A back-trace names only what a program exports; shared libraries leave these out again.
+    set_target_properties(qns_${name} PROPERTIES
+        CXX_VISIBILITY_PRESET default VISIBILITY_INLINES_HIDDEN OFF)
     if(arg_QT)
         set_target_properties(qns_${name} PROPERTIES AUTOMOC ON)
     endif()
