@@ -35,7 +35,10 @@ QNSYS_API int qnsys_getenv_hv_prefix(char* buffer, int capacity);
 /** The same for the data directory (media library and database). */
 QNSYS_API int qnsys_getenv_hv_data(char* buffer, int capacity);
 
-/** As openlog(3); `ident` is copied. */
+/**
+ * As openlog(3). `ident` is copied; null or empty stands for the program's name. Of the options
+ * only LOG_PID has a meaning: lines go to the log daemon and nowhere else.
+ */
 QNSYS_API void qnsys_openlog(const char* ident, int option, int facility);
 
 /**

@@ -28,8 +28,10 @@ std::string environmentOr(const char* variable, const std::string& otherwise) {
  */
 std::string findPrefix() {
     namespace fs = std::filesystem;
+    // Not an exported symbol: another library might have taken its place.
+    static const char kHere = 0;
     Dl_info info{};
-    if (dladdr(reinterpret_cast<void*>(&qnsys_init), &info) == 0 || info.dli_fname == nullptr)
+    if (dladdr(&kHere, &info) == 0 || info.dli_fname == nullptr)
         return QNS_INSTALL_PREFIX;
     std::error_code error;
     const fs::path library = fs::canonical(info.dli_fname, error);

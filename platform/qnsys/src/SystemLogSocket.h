@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <string_view>
+#include <string>
 
 #include "base/UniqueFd.h"
 
@@ -13,13 +13,17 @@ namespace qnsys {
 class SystemLogSocket {
 public:
     /** True when the log daemon has taken the line. */
-    bool send(std::string_view line);
+    bool send(const std::string& line);
 
 private:
+    enum class Outcome { taken, busy, failed };
+
     bool connect();
-    bool trySend(std::string_view line);
+    int connectAs(int type);
+    Outcome trySend(const std::string& line);
 
     qns::UniqueFd mSocket;
+    bool mIsStream = false; ///< lines are then told apart by a zero byte
 };
 
 } // namespace qnsys
