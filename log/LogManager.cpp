@@ -2,6 +2,7 @@
 #include "log/LogManager.h"
 
 #include <boost/thread/mutex.hpp>
+#include <cstdlib>
 #include <ctime>
 #include <unistd.h>
 
@@ -128,8 +129,7 @@ void LogManager::logDebugCamera(const char* name, int code, const char* format, 
 
 std::string LogManager::getCurrentTime() {
     timeval now{};
-    ::gettimeofday(&now, nullptr);
-    return formatTime(now);
+    return ::gettimeofday(&now, nullptr) == 0 ? formatTime(now) : std::string();
 }
 
 std::string LogManager::formatTime(const timeval& time) {

@@ -2,6 +2,7 @@
 #include "log/Logging.h"
 
 #include <atomic>
+#include <boost/thread/mutex.hpp>
 #include <cstdarg>
 #include <utility>
 
@@ -12,14 +13,18 @@ namespace {
 /** Null while logging is off. */
 std::atomic<ILogManager*> gLogManager{nullptr};
 
+boost::mutex gSwitchMutex; ///< held while logging is turned on or off
+
 } // namespace
 
 void INIT_LOGGING(std::wstring processName) {
+    const boost::mutex::scoped_lock lock(gSwitchMutex);
     gProcName = std::move(processName);
     gLogManager = LogManager::getInstance();
 }
 
 void UNINIT_LOGGING() {
+    const boost::mutex::scoped_lock lock(gSwitchMutex);
     LogManager::clearUp();
     gLogManager = nullptr;
 }

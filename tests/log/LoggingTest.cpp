@@ -1,209 +1,255 @@
 // SPDX-License-Identifier: MIT
 #include "log/Logging.h"
 
-#include <cstdlib>
-#include <ctime>
+#include <filesystem>
 #include <fstream>
-#include <gmock/gmock.h>
-#include <sys/stat.h>
+#include <iterator>
+#include <string>
 #include <thread>
 #include <unistd.h>
 #include <vector>
 
-#include "log/LogManager.h"
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
 #include "tests/tools/LogSocket.h"
 
-using ::testing::EndsWith;
-using ::testing::HasSubstr;
-using ::testing::MatchesRegex;
-using ::testing::SizeIs;
+namespace fs = std::filesystem;
 
 namespace {
 
-constexpr const char* kUserFile = "/var/log/qn_ope.log";
-constexpr const char* kDebugFile = "/var/log/qn_ope_debug.log";
+using testing::EndsWith;
+using testing::IsEmpty;
+using testing::StartsWith;
 
-std::vector<std::string> linesOf(const char* path) {
-    std::ifstream in(path);
-    std::vector<std::string> lines;
-    for (std::string line; std::getline(in, line);)
-        lines.push_back(line);
-    return lines;
+const std::string kUserFile = "/var/log/qn_ope.log";
+const std::string kDebugFile = "/var/log/qn_ope_debug.log";
+
+std::string contents(const std::string& path) {
+    std::ifstream file(path);
+    return {std::istreambuf_iterator<char>(file), {}};
 }
 
-class Logging : public ::testing::Test {
+/** What a line has after its time. */
+std::string lineEnd(const std::string& process, const std::string& rest) {
+    return " localhost " + process + "[" + std::to_string(::getpid()) + "]: " + rest + "\n";
+}
+
+constexpr const char* kTime = "[0-9]{4}-[0-9]{2}-[0-9]{2}T[0-9]{2}:[0-9]{2}:[0-9]{2}\\.[0-9]{6}"
+                              "[+-][0-9]{2}:[0-9]{2} localhost .*\n";
+
+class LoggingOff : public testing::Test {
 protected:
-    void SetUp() override {
-        ::unlink(kUserFile);
-        ::unlink(kDebugFile);
+    LoggingOff() { removeFiles(); }
+    ~LoggingOff() override {
+        UNINIT_LOGGING();
+        removeFiles();
     }
-    void TearDown() override { UNINIT_LOGGING(); }
+
+    static void removeFiles() {
+        fs::remove_all(kUserFile);
+        fs::remove_all(kDebugFile);
+    }
+
+    static void logEverywhere() {
+        LOG_EVENT(6, "Name", 101, "%d", 1);
+        LOG_EVENT(L"Name", 101, L"text", 6);
+        LOG_EVENT(std::string("Name"), 101, std::string("text"), 6);
+        LOG_USER_OPERATE("Name", 101, "%d", 1);
+        LOG_USER_OPERATE(L"Name", 101, L"text");
+        LOG_DEBUG_OPERATE(L"Name", 101, L"text");
+        LOG_DEBUG_CAMERA("Name", 101, "%d", 1);
+    }
+
+    LogSocket mDaemon;
 };
 
-TEST_F(Logging, IsSilentBeforeInitialisation) {
-    LogSocket log;
-    LOG_EVENT(6, "Module", 101, "%d", 1);
-    LOG_EVENT(std::wstring(L"Module"), 101, L"text", 6);
-    LOG_EVENT(std::string("Module"), 101, "text", 6);
-    LOG_USER_OPERATE("Module", 101, "%d", 1);
-    LOG_USER_OPERATE(L"Module", 101, L"text");
-    LOG_DEBUG_OPERATE(L"Module", 101, L"text");
-    LOG_DEBUG_CAMERA("Module", 101, "text");
-    EXPECT_FALSE(log.waiting());
-    EXPECT_THAT(linesOf(kUserFile), SizeIs(0));
+class Logging : public LoggingOff {
+protected:
+    Logging() { INIT_LOGGING(L"Process"); }
+};
+
+} // namespace
+
+TEST_F(LoggingOff, NothingIsWrittenAndNothingFails) {
+    logEverywhere();
+    EXPECT_EQ(mDaemon.waiting(), std::nullopt);
+    EXPECT_FALSE(fs::exists(kUserFile));
+    EXPECT_FALSE(fs::exists(kDebugFile));
 }
 
-TEST_F(Logging, IsSilentAgainAfterItsEnd) {
-    LogSocket log;
-    INIT_LOGGING(L"Process");
+TEST_F(Logging, MayBeTurnedOffAndOnAgainUnderAnotherName) {
     UNINIT_LOGGING();
-    LOG_EVENT(6, "Module", 101, "text");
-    EXPECT_FALSE(log.waiting());
+    logEverywhere();
+    EXPECT_EQ(mDaemon.waiting(), std::nullopt);
+    EXPECT_EQ(contents(kUserFile), "");
+    INIT_LOGGING(L"Other");
+    LOG_USER_OPERATE(L"Name", 101, L"text");
+    EXPECT_THAT(contents(kUserFile), EndsWith(lineEnd("Other", "[Name] 101: text")));
 }
 
-TEST_F(Logging, EventsGoToTheSystemLogWithNameAndCode) {
-    LogSocket log;
-    INIT_LOGGING(L"MediaPlayerService");
-    LOG_EVENT(3, "Module", 7, "%s is %d", "x", 5);
-    EXPECT_THAT(log.next().value_or(""),
-                MatchesRegex("<131>.*MediaPlayerService\\[[0-9]+\\]: Module 007: x is 5"));
-    LOG_EVENT(std::wstring(L"Wide"), 101, L"gr\u00fc\u00df", 4);
-    EXPECT_THAT(log.next().value_or(""), MatchesRegex("<132>.*: Wide 101: gr\u00fc\u00df"));
-    LOG_EVENT(std::string("Narrow"), 410, "text", 6);
-    EXPECT_THAT(log.next().value_or(""), MatchesRegex("<134>.*: Narrow 410: text"));
+TEST_F(Logging, KeepsTheNameThatItWasTurnedOnWith) {
+    INIT_LOGGING(L"Other");
+    LOG_EVENT(L"Name", 101, L"text", 6);
+    EXPECT_THAT(mDaemon.next().value_or(""),
+                EndsWith(" Process[" + std::to_string(::getpid()) + "]: Name 101: text"));
 }
 
-TEST_F(Logging, APercentSignIsAConversionInThePrintfFormOnly) {
-    LogSocket log;
-    INIT_LOGGING(L"Process");
-    LOG_EVENT(6, "100%%", 1, "text");
-    EXPECT_EQ(log.nextMessage(), "100% 001: text");
-    LOG_EVENT(std::string("100%d"), 1, "50%s", 6);
-    EXPECT_EQ(log.nextMessage(), "100%d 001: 50%s");
-    LOG_EVENT(std::wstring(L"100%d"), 1, L"50%s", 6);
-    EXPECT_EQ(log.nextMessage(), "100%d 001: 50%s");
+TEST_F(Logging, AnEventHasNameCodeAndText) {
+    LOG_EVENT(6, "Name", 7, "%s is %d", "answer", 42);
+    EXPECT_EQ(mDaemon.nextMessage(), "Name 007: answer is 42");
+    LOG_EVENT(L"Name", 101, L"text", 6);
+    EXPECT_EQ(mDaemon.nextMessage(), "Name 101: text");
+    LOG_EVENT(std::string("Name"), -1, std::string("text"), 6);
+    EXPECT_EQ(mDaemon.nextMessage(), "Name -01: text");
 }
 
-TEST_F(Logging, ThePrintfFormIsCutAt255CharactersBeforeExpansion) {
-    LogSocket log;
-    INIT_LOGGING(L"Process");
-    const std::string longName(300, 'n');
-    LOG_EVENT(6, longName.c_str(), 1, "text");
-    EXPECT_EQ(log.nextMessage(), std::string(255, 'n'));
-    LOG_EVENT(6, "Module", 1, "%s", std::string(1000, 'm').c_str());
-    EXPECT_EQ(log.nextMessage(), "Module 001: " + std::string(1000, 'm'));
+TEST_F(Logging, AnEventHasItsLevelAndTheLocalFacility) {
+    LOG_EVENT(3, "Name", 401, "failed");
+    EXPECT_THAT(mDaemon.next().value_or(""), StartsWith("<131>"));
+    LOG_EVENT(L"Name", 401, L"careful", 4);
+    EXPECT_THAT(mDaemon.next().value_or(""), StartsWith("<132>"));
+    LOG_EVENT(std::string("Name"), 101, std::string("done"), 6);
+    EXPECT_THAT(mDaemon.next().value_or(""), StartsWith("<134>"));
 }
 
-TEST_F(Logging, TheProcessNameOfTheFirstInitialisationStays) {
-    LogSocket log;
-    INIT_LOGGING(L"First");
-    INIT_LOGGING(L"Second");
-    LOG_EVENT(6, "Module", 1, "text");
-    EXPECT_THAT(log.next().value_or(""), HasSubstr(" First["));
+TEST_F(Logging, AnEventInPrintfFormTakesConversionsFromTheName) {
+    const char* format = "%s"; // with the name's there are two conversions
+    LOG_EVENT(6, "%s", 101, format, "name", "text");
+    EXPECT_EQ(mDaemon.nextMessage(), "name 101: text");
 }
 
-TEST_F(Logging, OperationsAreAppendedToTheirFilesAndFlushed) {
-    INIT_LOGGING(L"Process");
-    LOG_USER_OPERATE("Module", 12, "value %d", 3);
-    LOG_USER_OPERATE(L"Wide", 13, L"100%");
-    LOG_DEBUG_OPERATE(L"Debug", 14, L"text");
-    const std::string prefix = "[0-9-]+T[0-9:]+\\.[0-9]+[+-][0-9:]+ localhost Process\\[" +
-                               std::to_string(::getpid()) + "\\]: ";
-    const auto user = linesOf(kUserFile);
-    ASSERT_THAT(user, SizeIs(2));
-    EXPECT_THAT(user[0], MatchesRegex(prefix + "\\[Module\\] 012: value 3"));
-    EXPECT_THAT(user[1], MatchesRegex(prefix + "\\[Wide\\] 013: 100%"));
-    const auto debug = linesOf(kDebugFile);
-    ASSERT_THAT(debug, SizeIs(1));
-    EXPECT_THAT(debug[0], MatchesRegex(prefix + "\\[Debug\\] 014: text"));
+TEST_F(Logging, AnEventInAStringFormPrintsPercentSignsAsTheyStand) {
+    LOG_EVENT(L"100%s", 101, L"50%d", 6);
+    EXPECT_EQ(mDaemon.nextMessage(), "100%s 101: 50%d");
+    LOG_EVENT(std::string("100%s"), 101, std::string("50%d"), 6);
+    EXPECT_EQ(mDaemon.nextMessage(), "100%s 101: 50%d");
 }
 
-TEST_F(Logging, FileLinesInThePrintfFormAreCutAt511Characters) {
-    INIT_LOGGING(L"Process");
-    LOG_USER_OPERATE(std::string(600, 'n').c_str(), 1, "text");
-    const std::string all = linesOf(kUserFile).at(0);
-    EXPECT_THAT(all, SizeIs(511));
-    EXPECT_THAT(all, EndsWith("nnn"));
+TEST_F(Logging, AnEventInPrintfFormIsCutBeforeItsArgumentsAreExpanded) {
+    const std::string format = "%s" + std::string(1000, 'x');
+    const std::string argument(500, 'y');
+    LOG_EVENT(6, "Name", 101, format.c_str(), argument.c_str());
+    const std::string prefix = "Name 101: ";
+    EXPECT_EQ(mDaemon.nextMessage(), prefix + argument + std::string(255 - prefix.size() - 2, 'x'));
 }
 
-TEST_F(Logging, FilesThatCannotBeOpenedLoseTheirLinesSilently) {
-    ASSERT_EQ(::mkdir(kUserFile, 0700), 0);
-    ASSERT_EQ(::mkdir(kDebugFile, 0700), 0);
-    INIT_LOGGING(L"Process");
-    LOG_USER_OPERATE("Module", 1, "text");
-    LOG_USER_OPERATE(L"Module", 1, L"text");
-    LOG_DEBUG_OPERATE(L"Module", 1, L"text");
-    ::rmdir(kUserFile);
-    ::rmdir(kDebugFile);
+TEST_F(Logging, AnEventInAStringFormIsNotCut) {
+    LOG_EVENT(L"Name", 101, std::wstring(50000, L'x'), 6);
+    EXPECT_EQ(mDaemon.nextMessage(), "Name 101: " + std::string(50000, 'x'));
+}
+
+TEST_F(Logging, WideTextIsWrittenInTheLocale) {
+    LOG_EVENT(L"Z\u00fcrich", 101, L"\u4eac\U0001f600", 6);
+    EXPECT_EQ(mDaemon.nextMessage(), "Z\u00fcrich 101: \u4eac\U0001f600");
+}
+
+TEST_F(Logging, UserOperationsGoToTheirFileAndNowhereElse) {
+    LOG_USER_OPERATE("Name", 1, "%s is %d", "answer", 42);
+    EXPECT_THAT(contents(kUserFile), testing::MatchesRegex(kTime));
+    EXPECT_THAT(contents(kUserFile), EndsWith(lineEnd("Process", "[Name] 001: answer is 42")));
+    LOG_USER_OPERATE(L"Name", 102, L"text");
+    EXPECT_THAT(contents(kUserFile), EndsWith(lineEnd("Process", "[Name] 102: text")));
+    EXPECT_EQ(contents(kDebugFile), "");
+    EXPECT_EQ(mDaemon.waiting(), std::nullopt);
+}
+
+TEST_F(Logging, DebugOperationsGoToTheirFileAndNowhereElse) {
+    LOG_DEBUG_OPERATE(L"Name", 102, L"text");
+    EXPECT_THAT(contents(kDebugFile), testing::MatchesRegex(kTime));
+    EXPECT_THAT(contents(kDebugFile), EndsWith(lineEnd("Process", "[Name] 102: text")));
+    EXPECT_EQ(contents(kUserFile), "");
+    EXPECT_EQ(mDaemon.waiting(), std::nullopt);
 }
 
 TEST_F(Logging, CameraMessagesAreDropped) {
-    LogSocket log;
-    INIT_LOGGING(L"Process");
-    LOG_DEBUG_CAMERA("Module", 1, "text");
-    EXPECT_FALSE(log.waiting());
-    EXPECT_THAT(linesOf(kUserFile), SizeIs(0));
-    EXPECT_THAT(linesOf(kDebugFile), SizeIs(0));
+    LOG_DEBUG_CAMERA("Name", 101, "%d", 1);
+    EXPECT_EQ(mDaemon.waiting(), std::nullopt);
+    EXPECT_EQ(contents(kUserFile) + contents(kDebugFile), "");
+    const fs::directory_iterator files("/var/log");
+    EXPECT_EQ(std::distance(begin(files), end(files)), 2);
 }
 
-TEST_F(Logging, ConcurrentFirstCallsMakeOneManager) {
-    std::vector<LogManager*> managers(8);
-    std::vector<std::thread> threads;
-    for (LogManager*& manager : managers)
-        threads.emplace_back([&manager] { manager = LogManager::getInstance(); });
-    for (std::thread& thread : threads)
-        thread.join();
-    for (LogManager* manager : managers)
-        EXPECT_EQ(manager, managers[0]);
+TEST_F(Logging, FilesAreAppendedTo) {
+    UNINIT_LOGGING();
+    std::ofstream(kUserFile) << "before\n";
+    INIT_LOGGING(L"Process");
+    LOG_USER_OPERATE(L"Name", 101, L"text");
+    EXPECT_THAT(contents(kUserFile), StartsWith("before\n"));
+    EXPECT_THAT(contents(kUserFile), EndsWith("[Name] 101: text\n"));
 }
 
-TEST_F(Logging, LinesOfSeveralThreadsStayWhole) {
+TEST_F(Logging, AFileLineInPrintfFormTakesConversionsFromTheNames) {
+    UNINIT_LOGGING();
+    INIT_LOGGING(L"50%%");
+    const char* format = "%s";
+    LOG_USER_OPERATE("%s", 101, format, "name", "text");
+    EXPECT_THAT(contents(kUserFile), EndsWith(lineEnd("50%", "[name] 101: text")));
+}
+
+TEST_F(Logging, AFileLineInAStringFormPrintsPercentSignsAsTheyStand) {
+    UNINIT_LOGGING();
+    INIT_LOGGING(L"50%%");
+    LOG_USER_OPERATE(L"100%s", 101, L"%n%s");
+    EXPECT_THAT(contents(kUserFile), EndsWith(lineEnd("50%%", "[100%s] 101: %n%s")));
+    LOG_DEBUG_OPERATE(L"100%s", 101, L"%n%s");
+    EXPECT_THAT(contents(kDebugFile), EndsWith(lineEnd("50%%", "[100%s] 101: %n%s")));
+}
+
+TEST_F(Logging, AFileLineInPrintfFormIsCutBeforeItsArgumentsAreExpanded) {
+    const std::string format = "%s" + std::string(1000, 'x');
+    const std::string argument(2000, 'y');
+    LOG_USER_OPERATE("Name", 101, format.c_str(), argument.c_str());
+    const std::string line = contents(kUserFile);
+    EXPECT_EQ(line.size(), 511 - 2 + argument.size());
+    EXPECT_THAT(line, EndsWith("yyx" + std::string(line.size() - line.rfind('y') - 2, 'x')));
+}
+
+TEST_F(Logging, AFileLineInAStringFormIsNotCut) {
+    LOG_USER_OPERATE(L"Name", 101, std::wstring(100000, L'x'));
+    EXPECT_THAT(contents(kUserFile), EndsWith("101: " + std::string(100000, 'x') + "\n"));
+}
+
+TEST_F(LoggingOff, AFileThatCannotBeOpenedLosesItsLinesAndNoOthers) {
+    fs::create_directory(kUserFile);
     INIT_LOGGING(L"Process");
+    LOG_USER_OPERATE("Name", 101, "%d", 1);
+    LOG_USER_OPERATE(L"Name", 101, L"text");
+    LOG_DEBUG_OPERATE(L"Name", 101, L"text");
+    EXPECT_TRUE(fs::is_directory(kUserFile));
+    EXPECT_THAT(contents(kDebugFile), EndsWith(lineEnd("Process", "[Name] 101: text")));
+}
+
+TEST_F(LoggingOff, AFullDiskHarmsNobody) {
+    fs::create_symlink("/dev/full", kUserFile);
+    fs::create_symlink("/dev/full", kDebugFile);
+    INIT_LOGGING(L"Process");
+    for (int i = 0; i < 3; ++i)
+        logEverywhere();
+    EXPECT_EQ(mDaemon.nextMessage(), "Name 101: 1");
+}
+
+TEST_F(LoggingOff, ThreadsMayTurnItOnAndLogAtTheSameTime) {
+    constexpr int kThreads = 8;
+    constexpr int kLines = 100;
     std::vector<std::thread> threads;
-    for (int i = 0; i < 8; ++i)
+    for (int i = 0; i < kThreads; ++i)
         threads.emplace_back([] {
-            for (int line = 0; line < 50; ++line)
-                LOG_USER_OPERATE("Module", 1, "%s", "a line that is written whole");
+            INIT_LOGGING(L"Process");
+            for (int line = 0; line < kLines; ++line) {
+                LOG_USER_OPERATE("Name", 101, "%s", "text");
+                LOG_USER_OPERATE(L"Name", 101, L"text");
+                LOG_EVENT(L"Name", 101, L"text", 6);
+            }
         });
     for (std::thread& thread : threads)
         thread.join();
-    const auto lines = linesOf(kUserFile);
-    ASSERT_THAT(lines, SizeIs(400));
-    for (const std::string& line : lines)
-        EXPECT_THAT(line, EndsWith("[Module] 001: a line that is written whole"));
-}
-
-class TimeStamp : public ::testing::TestWithParam<std::pair<const char*, const char*>> {
-protected:
-    void TearDown() override {
-        ::unsetenv("TZ");
-        ::tzset();
+    while (mDaemon.waiting()) {
     }
-};
-
-TEST_P(TimeStamp, TellsTheOffset) {
-    ::setenv("TZ", GetParam().first, 1);
-    ::tzset();
-    EXPECT_THAT(LogManager::formatTime({1'700'000'000, 42}), EndsWith(GetParam().second));
+    LOG_EVENT(L"Name", 101, L"end", 6); // what was dropped is told here and not in another test
+    std::ifstream file(kUserFile);
+    int lines = 0;
+    for (std::string line; std::getline(file, line); ++lines)
+        EXPECT_THAT(line + "\n", EndsWith(lineEnd("Process", "[Name] 101: text")));
+    EXPECT_EQ(lines, 2 * kThreads * kLines);
 }
-
-// POSIX writes what is to be added to local time to get UTC.
-INSTANTIATE_TEST_SUITE_P(Offsets, TimeStamp,
-                         ::testing::Values(std::pair{"XXX-9", "T07:13:20.000042+09:00"},
-                                           std::pair{"XXX-5:30", "T03:43:20.000042+05:30"},
-                                           std::pair{"XXX0:30", "T21:43:20.000042+00:30"},
-                                           std::pair{"XXX3:30", "T18:43:20.000042-03:30"},
-                                           std::pair{"UTC0", "T22:13:20.000042+00:00"}));
-
-TEST(LogManagerTime, IsEmptyWhenTheTimeCannotBeTold) {
-    EXPECT_EQ(LogManager::formatTime({INT64_MAX, 0}), "");
-}
-
-TEST(LogManagerNumbers, AreDecimal) {
-    EXPECT_EQ(LogManager::intToStringType(0), "0");
-    EXPECT_EQ(LogManager::intToStringType(-12), "-12");
-    EXPECT_EQ(LogManager::intToStringType(INT32_MIN), "-2147483648");
-    EXPECT_EQ(LogManager::getProcID(), std::to_string(::getpid()));
-}
-
-} // namespace
