@@ -45,6 +45,8 @@ function(qns_add_folder name)
     # A back-trace names only what a program exports; shared libraries leave these out again.
     set_target_properties(qns_${name} PROPERTIES
         CXX_VISIBILITY_PRESET default VISIBILITY_INLINES_HIDDEN OFF)
+    # What is exported could be replaced at run time, which forbids inlining: ours is not.
+    target_compile_options(qns_${name} PRIVATE -fno-semantic-interposition)
     if(arg_QT)
         set_target_properties(qns_${name} PROPERTIES AUTOMOC ON)
     endif()
