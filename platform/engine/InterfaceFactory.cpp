@@ -3,13 +3,13 @@
 
 #include <memory>
 
-#include "gst/Barrier.h"
+#include "handle/Barrier.h"
 #include "player/Player.h"
 
 namespace LibMediaPlayer {
 
 IMediaPlayer* InterfaceFactory::createPlayer(void* window, unsigned int flags) {
-    return gst::guarded<IMediaPlayer*>(
+    return handle::guarded<IMediaPlayer*>(
         nullptr, [&] { return std::make_unique<engine::Player>(window, flags).release(); });
 }
 

@@ -3,15 +3,15 @@
 
 #include <memory>
 
-#include "gst/Barrier.h"
+#include "handle/Barrier.h"
 
 namespace gst {
 
 namespace {
 
 GstPadProbeReturn callFunction(GstPad*, GstPadProbeInfo* info, gpointer function) {
-    return guarded(GST_PAD_PROBE_OK,
-                   [&] { return (*static_cast<PadProbe::Function*>(function))(*info); });
+    return handle::guarded(GST_PAD_PROBE_OK,
+                           [&] { return (*static_cast<PadProbe::Function*>(function))(*info); });
 }
 
 void deleteFunction(gpointer function) {

@@ -3,9 +3,15 @@
 
 #include <gst/gst.h>
 
-#include "gst/Handle.h"
+#include "handle/Handle.h"
 
 namespace gst {
+
+using handle::kAdopt;
+using handle::kRef;
+using handle::kSink;
+using handle::SharedHandle;
+using handle::UniqueHandle;
 
 template<typename T>
 struct ObjectTraits {

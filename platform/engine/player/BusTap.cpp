@@ -3,7 +3,7 @@
 
 #include <utility>
 
-#include "gst/Barrier.h"
+#include "handle/Barrier.h"
 
 namespace engine {
 
@@ -28,7 +28,7 @@ bool isWanted(GstMessage* message, const Target& target) {
 
 GstBusSyncReply takeMessage(GstBus*, GstMessage* message, gpointer data) {
     const auto& target = *static_cast<Target*>(data);
-    gst::guarded([&] {
+    handle::guarded([&] {
         if (isWanted(message, target))
             target.mailbox->post(BusEvent{target.number, gst::Message(gst::kRef, message)});
     });

@@ -3,8 +3,8 @@
 
 #include <utility>
 
-#include "gst/Barrier.h"
 #include "gst/Library.h"
+#include "handle/Barrier.h"
 #include "player/Session.h"
 
 namespace engine {
@@ -47,7 +47,7 @@ void Engine::run() {
     gst::initialise();
     while (!mQuit) {
         const TimePoint deadline = mpSession ? mpSession->deadline() : kNever;
-        gst::guarded([&] {
+        handle::guarded([&] {
             if (auto item = mpMailbox->take(deadline))
                 handle(*item);
             else

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include "player/Outlet.h"
 
-#include "gst/Barrier.h"
+#include "handle/Barrier.h"
 
 namespace engine {
 
@@ -29,7 +29,7 @@ void Outlet::deliverLast(std::uint64_t session, Notification notification) {
 void Outlet::call(Notification& notification) const {
     // A copy, because the function may set another one.
     if (const Function function = mFunction)
-        gst::guarded([&] { function(notification); });
+        handle::guarded([&] { function(notification); });
 }
 
 } // namespace engine

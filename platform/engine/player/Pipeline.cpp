@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include "player/Pipeline.h"
 
+#include <algorithm>
 #include <utility>
 
 #include "player/SinkTap.h"
@@ -21,6 +22,7 @@ Pipeline::~Pipeline() {
     // First nobody is told any more, then all streaming threads end, then the parts may go.
     mProbes.clear();
     mpBusTap.reset();
+    mParts.signals.clear();
     gst_element_set_state(mParts.pipeline.get(), GST_STATE_NULL);
 }
 

@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "gst/PadProbe.h"
+#include "gst/Signal.h"
 #include "gst/Types.h"
 #include "player/BusTap.h"
 #include "player/Items.h"
@@ -26,6 +27,7 @@ public:
         gst::Element pipeline;
         gst::Element videoSink;
         gst::Element audioSink;
+        std::vector<gst::Signal> signals; ///< by which it builds itself
     };
 
     Pipeline(Parts parts, std::uint64_t number, const std::shared_ptr<EngineMailbox>& mailbox);
@@ -52,7 +54,7 @@ public:
     [[nodiscard]] std::string graph() const;
 
 private:
-    const Parts mParts;
+    Parts mParts;
     const std::uint64_t mNumber;
     std::unique_ptr<BusTap> mpBusTap;
     std::vector<gst::PadProbe> mProbes;

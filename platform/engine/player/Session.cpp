@@ -7,8 +7,9 @@
 #include <utility>
 
 #include "LibMediaPlayer/Result.h"
+#include "player/ChainTable.h"
+#include "player/FixedChain.h"
 #include "player/PlaybinChain.h"
-#include "text/Text.h"
 
 namespace engine {
 
@@ -23,14 +24,6 @@ constexpr std::chrono::seconds kSeekTime{5};
 std::uint64_t nextPipelineNumber() {
     static std::atomic<std::uint64_t> number{0};
     return ++number;
-}
-
-std::string toUri(const std::wstring& path) {
-    std::string bytes = toBytes(path);
-    if (gst_uri_is_valid(bytes.c_str()))
-        return bytes;
-    const gst::Chars uri(gst::kAdopt, gst_filename_to_uri(bytes.c_str(), nullptr));
-    return uri ? uri.get() : "";
 }
 
 void writeWhole(int file, std::string_view text) {
@@ -55,8 +48,37 @@ Session::~Session() = default;
 
 void Session::open() {
     mOpenDeadline = SteadyClock::now() + kOpenTime;
-    mpPipeline = std::make_unique<Pipeline>(buildPlaybinChain(toUri(mpTicket->path()), mOptions),
-                                            nextPipelineNumber(), mpMailbox);
+    mMedium = toMedium(mpTicket->path());
+    if (!mMedium.path.empty()) {
+        const probe::LookResult result = probe::lookAt(mMedium.path);
+        if (const auto* const refused = std::get_if<probe::LookFailure>(&result))
+            return fail(failure(refused->result));
+        if (const auto* const look = std::get_if<probe::MediaLook>(&result))
+            mLook = *look;
+    }
+    if (!openFixedChain())
+        openPlaybin();
+}
+
+bool Session::openFixedChain() {
+    const auto plan = mLook ? planChain(*mLook, mOptions) : std::nullopt;
+    auto parts = plan ? buildFixedChain(mMedium.path, *plan, mOptions) : std::nullopt;
+    if (!parts)
+        return false;
+    mFixed = true;
+    start(*std::move(parts));
+    return true;
+}
+
+void Session::openPlaybin() {
+    mFixed = false;
+    start(buildPlaybinChain(mMedium.uri, mOptions));
+}
+
+void Session::start(Pipeline::Parts parts) {
+    mTimelines = {};
+    mpPipeline.reset();
+    mpPipeline = std::make_unique<Pipeline>(std::move(parts), nextPipelineNumber(), mpMailbox);
     mLive = mpPipeline->setState(GST_STATE_PAUSED) == GST_STATE_CHANGE_NO_PREROLL;
     if (mLive)
         becomeReady();
@@ -148,6 +170,9 @@ void Session::onDeadline() {
 }
 
 void Session::onError(GstMessage* message) {
+    // What does not fit the table may still be played.
+    if (mState == kNotReady && mFixed)
+        return openPlaybin();
     fail(failureOf(message));
 }
 
@@ -239,6 +264,11 @@ void Session::tellOpened(const Failure& failure) {
     opened.text = failure.result == kOk ? mpTicket->path() : failure.text;
     if (failure.result == kOk) {
         opened.value = mDuration.count();
+        if (mLook) {
+            opened.param1 = mLook->videoCount;
+            opened.param2 = mLook->audioCount;
+            opened.param3 = mLook->textCount;
+        }
         opened.uvalue1 = (mpPipeline->isSeekable() ? 1U : 0U) | (mLive ? 2U : 0U);
     }
     notify(std::move(opened));

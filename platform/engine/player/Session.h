@@ -10,9 +10,11 @@
 #include "player/Failure.h"
 #include "player/Front.h"
 #include "player/Items.h"
+#include "player/Medium.h"
 #include "player/Options.h"
 #include "player/Pipeline.h"
 #include "player/Timeline.h"
+#include "probe/MediaLook.h"
 
 namespace engine {
 
@@ -63,6 +65,9 @@ private:
     void onClockLost(GstMessage* message);
     void onLatency(GstMessage* message);
 
+    bool openFixedChain();
+    void openPlaybin();
+    void start(Pipeline::Parts parts);
     void becomeReady();
     void fail(const Failure& failure);
     void tellOpened(const Failure& failure);
@@ -87,6 +92,10 @@ private:
     const PlayerOptions mOptions;
     const std::shared_ptr<EngineMailbox> mpMailbox;
     const std::shared_ptr<OpenTicket> mpTicket;
+
+    Medium mMedium;
+    std::optional<probe::MediaLook> mLook;
+    bool mFixed = false; ///< the pipeline was planned, not found out by itself
 
     LibMediaPlayer::PlayerState mState = LibMediaPlayer::kNotReady;
     TimePoint mOpenDeadline = kNever;

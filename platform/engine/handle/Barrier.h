@@ -3,7 +3,7 @@
 
 #include <utility>
 
-namespace gst {
+namespace handle {
 
 /** Runs what a C library or a foreign thread called: nothing is thrown into the caller. */
 template<typename Result, typename Function>
@@ -23,4 +23,4 @@ void guarded(Function&& function) noexcept {
     }
 }
 
-} // namespace gst
+} // namespace handle

@@ -5,9 +5,9 @@
 
 /**
  * Owners of what C libraries hand out. A traits struct says how one type is released and, where
- * it is counted, referenced; a new type costs a few lines in Types.h.
+ * it is counted, referenced; a new type costs a few lines.
  */
-namespace gst {
+namespace handle {
 
 /** How a reference comes into a handle. */
 struct Adopt {}; ///< the caller's reference becomes the handle's
@@ -96,4 +96,4 @@ private:
     Pointer mpObject = nullptr;
 };
 
-} // namespace gst
+} // namespace handle

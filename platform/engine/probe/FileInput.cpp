@@ -1,0 +1,67 @@
+// SPDX-License-Identifier: MIT
+#include "probe/FileInput.h"
+
+#include <cerrno>
+#include <cstdio>
+#include <unistd.h>
+#include <utility>
+
+namespace probe {
+
+namespace {
+
+constexpr int kBufferSize = 32 * 1024;
+
+} // namespace
+
+FileInput::FileInput(qns::UniqueFd file, std::int64_t size, std::int64_t byteBudget,
+                     std::chrono::milliseconds timeBudget)
+    : mFile(std::move(file)),
+      mSize(size),
+      mDeadline(std::chrono::steady_clock::now() + timeBudget),
+      mBytesLeft(byteBudget),
+      mContext(kAdopt, avio_alloc_context(static_cast<unsigned char*>(av_malloc(kBufferSize)),
+                                          kBufferSize, 0, this, readBytes, nullptr, seekTo)) {}
+
+bool FileInput::isExhausted() const {
+    return mBytesLeft <= 0 || std::chrono::steady_clock::now() >= mDeadline;
+}
+
+int FileInput::readBytes(void* input, std::uint8_t* buffer, int size) {
+    return static_cast<FileInput*>(input)->read(buffer, size);
+}
+
+std::int64_t FileInput::seekTo(void* input, std::int64_t offset, int whence) {
+    return static_cast<FileInput*>(input)->seek(offset, whence);
+}
+
+int FileInput::read(std::uint8_t* buffer, int size) {
+    if (isExhausted())
+        return AVERROR_EXIT;
+    const ssize_t count =
+        ::pread(mFile.get(), buffer, static_cast<std::size_t>(size), static_cast<off_t>(mOffset));
+    if (count < 0)
+        return AVERROR(errno);
+    if (count == 0)
+        return AVERROR_EOF;
+    mOffset += count;
+    mBytesLeft -= count;
+    return static_cast<int>(count);
+}
+
+std::int64_t FileInput::seek(std::int64_t offset, int whence) {
+    switch (whence & ~AVSEEK_FORCE) {
+    case AVSEEK_SIZE:
+        return mSize;
+    case SEEK_SET:
+        return mOffset = offset;
+    case SEEK_CUR:
+        return mOffset += offset;
+    case SEEK_END:
+        return mOffset = mSize + offset;
+    default:
+        return AVERROR(EINVAL);
+    }
+}
+
+} // namespace probe
