@@ -41,6 +41,7 @@ struct CharsTraits {
 using Element = SharedHandle<ObjectTraits<GstElement>>;
 using Pad = SharedHandle<ObjectTraits<GstPad>>;
 using Bus = SharedHandle<ObjectTraits<GstBus>>;
+using StreamCollection = SharedHandle<ObjectTraits<GstStreamCollection>>;
 using Clock = SharedHandle<ObjectTraits<GstClock>>;
 using Message = SharedHandle<MiniObjectTraits<GstMessage>>;
 using Caps = SharedHandle<MiniObjectTraits<GstCaps>>;

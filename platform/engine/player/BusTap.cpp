@@ -17,7 +17,8 @@ struct Target {
 
 constexpr int kWanted = GST_MESSAGE_ERROR | GST_MESSAGE_EOS | GST_MESSAGE_ASYNC_DONE |
                         GST_MESSAGE_SEGMENT_DONE | GST_MESSAGE_BUFFERING | GST_MESSAGE_CLOCK_LOST |
-                        GST_MESSAGE_LATENCY | GST_MESSAGE_STREAM_COLLECTION;
+                        GST_MESSAGE_LATENCY | GST_MESSAGE_DURATION_CHANGED |
+                        GST_MESSAGE_STREAM_COLLECTION;
 
 bool isWanted(GstMessage* message, const Target& target) {
     // Every element tells its state; only the whole pipeline's is of interest.

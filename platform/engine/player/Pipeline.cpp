@@ -45,10 +45,15 @@ ClockAnchor Pipeline::anchor() const {
     GstElement* const pipeline = mParts.pipeline.get();
     const gst::Clock clock(gst::kAdopt, gst_element_get_clock(pipeline));
     if (!clock || state() != GST_STATE_PLAYING)
-        return {SteadyClock::now(), Nanoseconds(gst_element_get_start_time(pipeline))};
+        return {SteadyClock::now(), stoppedTime()};
     const auto base = static_cast<gint64>(gst_element_get_base_time(pipeline));
     const auto now = static_cast<gint64>(gst_clock_get_time(clock.get()));
     return {SteadyClock::now(), Nanoseconds(now - base)};
+}
+
+Nanoseconds Pipeline::stoppedTime() const {
+    const GstClockTime time = gst_element_get_start_time(mParts.pipeline.get());
+    return Nanoseconds(GST_CLOCK_TIME_IS_VALID(time) ? time : 0);
 }
 
 Nanoseconds Pipeline::duration() const {

@@ -43,8 +43,10 @@ public:
     /** `stop` nothing: to the end. False when the medium cannot. */
     bool seek(GstSeekFlags flags, Nanoseconds start, std::optional<Nanoseconds> stop);
 
-    /** Of what reaches the sinks now; stands while the pipeline is paused. */
     [[nodiscard]] ClockAnchor anchor() const;
+
+    /** The running time at which the pipeline was last paused, or flushed. */
+    [[nodiscard]] Nanoseconds stoppedTime() const;
 
     [[nodiscard]] Nanoseconds duration() const; ///< 0 when unknown
     [[nodiscard]] bool isSeekable() const;

@@ -1,7 +1,9 @@
 // SPDX-License-Identifier: MIT
 #include "player/Player.h"
 
+#include <algorithm>
 #include <cerrno>
+#include <climits>
 #include <fcntl.h>
 #include <utility>
 
@@ -35,6 +37,18 @@ int resultOfErrno(int error) {
     }
 }
 
+/** Brings the ends inside the medium; false when nothing is between them. */
+bool fitLoop(RepeatParam& param, Nanoseconds duration) {
+    if (!param.repeat)
+        return true;
+    param.start = std::max(param.start, 0L);
+    param.end = std::max(param.end, -1L);
+    const long last = duration > Nanoseconds::zero() ? duration.count() : LONG_MAX;
+    if (param.end > last)
+        param.end = last;
+    return param.start < (param.end < 0 ? last : param.end);
+}
+
 } // namespace
 
 template<typename Order>
@@ -59,6 +73,7 @@ int Player::open(const std::wstring& path, int format) {
     mpFront->status.begin(session, kNotReady);
     auto ticket = std::make_shared<OpenTicket>(session, path, format);
     post(OpenOrder{ticket});
+    post(RepeatOrder{std::exchange(mNextLoop, {})});
     mWatchdog.watch(std::move(ticket));
     return kOk;
 }
@@ -117,7 +132,13 @@ int Player::dumpGraph(const std::wstring& path) {
 }
 
 int Player::repeat(RepeatParam& param) {
-    post(RepeatOrder{param});
+    const StatusClock::Reading reading = mpFront->status.read();
+    if (!fitLoop(param, reading.duration))
+        return kWrongState;
+    if (isOpen())
+        post(RepeatOrder{param});
+    else
+        mNextLoop = param;
     return kOk;
 }
 

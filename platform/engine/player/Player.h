@@ -39,7 +39,8 @@ private:
 
     const PlayerOptions mOptions;
     const std::shared_ptr<Front> mpFront = std::make_shared<Front>();
-    std::mutex mMutex; ///< guards mpEngine
+    LibMediaPlayer::RepeatParam mNextLoop; ///< ordered before there was a medium; the caller's
+    std::mutex mMutex;                     ///< guards mpEngine
     std::shared_ptr<Engine> mpEngine;
     Watchdog mWatchdog; ///< last, so that it ends first
 };

@@ -1,11 +1,9 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <array>
 #include <cstdint>
 #include <memory>
 #include <optional>
-#include <string>
 
 #include "player/Failure.h"
 #include "player/Front.h"
@@ -13,14 +11,15 @@
 #include "player/Medium.h"
 #include "player/Options.h"
 #include "player/Pipeline.h"
-#include "player/Timeline.h"
+#include "player/Playback.h"
+#include "player/Reporter.h"
 #include "probe/MediaLook.h"
 
 namespace engine {
 
 /**
- * One opened medium, from open() to the next open() or close(). Only the engine's thread uses it.
- * Orders that come while it opens are kept until it is ready.
+ * One opened medium, from open() to the next open() or close(): how it is opened and how it
+ * fails. In between Playback has the word. Only the engine's thread uses it.
  */
 class Session {
 public:
@@ -33,79 +32,49 @@ public:
     /** Begins to open; the answer follows when the pipeline has told. */
     void open();
 
-    void take(PlayOrder&);
-    void take(PauseOrder&);
-    void take(SeekOrder& order);
-    void take(RepeatOrder& order);
+    void take(PlayOrder&) { mPlayback.play(); }
+    void take(PauseOrder&) { mPlayback.pause(); }
+    void take(SeekOrder& order) { mPlayback.seek(order); }
+    void take(RepeatOrder& order) { mPlayback.repeat(order.param); }
+    void take(RefreshOrder&) { mPlayback.refreshClock(); }
     void take(DumpOrder& order);
-    void take(RefreshOrder&);
 
     [[nodiscard]] bool owns(std::uint64_t pipeline) const;
     void onMessage(GstMessage* message);
-    void onSinkEvent(const SinkEvent& event);
+    void onSinkEvent(const SinkEvent& event) { mPlayback.onSinkEvent(event); }
 
     /** When onDeadline() wants to be called if nothing else happens. */
     [[nodiscard]] TimePoint deadline() const;
     void onDeadline();
 
 private:
-    /** A seek on its way: it is over when, after a flush, the sinks have data again. */
-    struct Flight {
-        Nanoseconds target{};
-        bool announced = false;
-        bool flushed = false;
-        TimePoint deadline{};
-    };
-
-    void onError(GstMessage* message);
-    void onEnd(GstMessage* message);
-    void onPrerolled(GstMessage* message);
-    void onStateChanged(GstMessage* message);
-    void onBuffering(GstMessage* message);
-    void onClockLost(GstMessage* message);
-    void onLatency(GstMessage* message);
-
+    [[nodiscard]] bool isOpening() const { return mOpenDeadline != kNever; }
+    bool look();
     bool openFixedChain();
     void openPlaybin();
     void start(Pipeline::Parts parts);
     void becomeReady();
+    void tellOpened(Nanoseconds duration);
     void fail(const Failure& failure);
-    void tellOpened(const Failure& failure);
 
-    void startSeek(Nanoseconds target, int mode, bool announced);
-    void finishSeek(int result);
-    void startNextSeek();
-    [[nodiscard]] Nanoseconds seekTarget(const SeekOrder& order) const;
+    void onError(GstMessage* message);
+    void onPrerolled();
+    void onStateChanged(GstMessage* message);
+    void onSegmentDone(GstMessage* message);
+    void onBuffering(GstMessage* message);
+    void onStreams(GstMessage* message);
 
-    void applyPlaying();
-    void startClock();
-    void stopClock();
-    void setState(LibMediaPlayer::PlayerState state);
-    void notify(int type, int result, Nanoseconds value);
-    void notify(LibMediaPlayer::MediaPlayerNotify notification);
-
-    [[nodiscard]] const Timeline& timeline() const;
-    [[nodiscard]] Nanoseconds position() const;
-    [[nodiscard]] std::uint64_t session() const { return mpTicket->session(); }
-
-    Front& mFront;
     const PlayerOptions mOptions;
     const std::shared_ptr<EngineMailbox> mpMailbox;
     const std::shared_ptr<OpenTicket> mpTicket;
+    Reporter mReporter;
+    Playback mPlayback;
 
-    Medium mMedium;
-    std::optional<probe::MediaLook> mLook;
-    bool mFixed = false; ///< the pipeline was planned, not found out by itself
-
-    LibMediaPlayer::PlayerState mState = LibMediaPlayer::kNotReady;
     TimePoint mOpenDeadline = kNever;
-    bool mWantPlaying = false;
-    bool mBuffering = false;
+    Medium mMedium;
+    probe::MediaLook mLook;
+    bool mFixed = false; ///< the pipeline was planned, it did not find out by itself
     bool mLive = false;
-    Nanoseconds mDuration{};
-    std::array<Timeline, 2> mTimelines; ///< by StreamKind
-    std::optional<Flight> mFlight;
-    std::optional<SeekOrder> mNextSeek;
 
     std::unique_ptr<Pipeline> mpPipeline; ///< last, so that it goes first
 };

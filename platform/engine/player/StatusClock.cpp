@@ -39,7 +39,8 @@ void StatusClock::hold(std::uint64_t session, Nanoseconds position) {
     mHeld = position;
 }
 
-void StatusClock::run(std::uint64_t session, const Timeline& timeline, const ClockAnchor& anchor) {
+void StatusClock::run(std::uint64_t session, const Timeline& timeline, const ClockAnchor& anchor,
+                      std::optional<Nanoseconds> limit) {
     const std::lock_guard lock(mMutex);
     if (session != mSession)
         return;
@@ -48,6 +49,7 @@ void StatusClock::run(std::uint64_t session, const Timeline& timeline, const Clo
     mRunning = true;
     mTimeline = timeline;
     mAnchor = anchor;
+    mLimit = limit;
 }
 
 Nanoseconds StatusClock::runningTime() const {
@@ -56,8 +58,10 @@ Nanoseconds StatusClock::runningTime() const {
 }
 
 Nanoseconds StatusClock::position() const {
-    const Nanoseconds position = mRunning ? mTimeline.positionAt(runningTime()) : mHeld;
-    return mDuration > Nanoseconds::zero() ? std::min(position, mDuration) : position;
+    if (!mRunning)
+        return mHeld;
+    const Nanoseconds end = mDuration > Nanoseconds::zero() ? mDuration : Nanoseconds::max();
+    return std::min(mTimeline.positionAt(runningTime()), mLimit.value_or(end));
 }
 
 } // namespace engine

@@ -3,6 +3,7 @@
 
 #include <cstdint>
 #include <mutex>
+#include <optional>
 
 #include "LibMediaPlayer/IMediaPlayer.h"
 #include "player/Time.h"
@@ -41,8 +42,12 @@ public:
     /** Stops at a position. */
     void hold(std::uint64_t session, Nanoseconds position);
 
-    /** Runs along the timeline; again with a new anchor, never backwards. */
-    void run(std::uint64_t session, const Timeline& timeline, const ClockAnchor& anchor);
+    /**
+     * Runs along the timeline, and not beyond `limit`. Called again while it runs, with a newer
+     * anchor, it does not step back.
+     */
+    void run(std::uint64_t session, const Timeline& timeline, const ClockAnchor& anchor,
+             std::optional<Nanoseconds> limit);
 
 private:
     [[nodiscard]] Nanoseconds runningTime() const;
@@ -56,6 +61,7 @@ private:
     Nanoseconds mHeld{};
     Timeline mTimeline;
     ClockAnchor mAnchor;
+    std::optional<Nanoseconds> mLimit;
     mutable Nanoseconds mLatest{}; ///< the greatest running time told
 };
 
