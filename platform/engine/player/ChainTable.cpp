@@ -29,13 +29,13 @@ constexpr ContainerEntry kContainers[] = {
     {"mpegts", "tsdemux", Framing::kParser},
     {"mpeg", "mpegpsdemux", Framing::kParser},
     {"wav", "wavparse", Framing::kContainer},
-    {"gif", "avdemux_gif", Framing::kContainer},
     {"mp3", nullptr, Framing::kParser},
     {"aac", nullptr, Framing::kParser},
     {"flac", nullptr, Framing::kParser},
     {"ac3", nullptr, Framing::kParser},
     {"jpeg_pipe", nullptr, Framing::kContainer},
     {"png_pipe", nullptr, Framing::kContainer},
+    {"gif", nullptr, Framing::kContainer},
 };
 
 struct CodecEntry {
@@ -55,7 +55,7 @@ constexpr CodecEntry kCodecs[] = {
     {"mpeg1video", "mpegvideoparse", true, "avdec_mpeg2video"},
     {"mjpeg", nullptr, false, "jpegdec"},
     {"png", nullptr, false, "pngdec"},
-    {"gif", nullptr, false, "avdec_gif"},
+    {"gif", nullptr, false, "gdkpixbufdec"},
     {"aac", "aacparse", false, "avdec_aac"},
     {"mp3", "mpegaudioparse", true, "mpg123audiodec"},
     {"mp2", "mpegaudioparse", true, "mpg123audiodec"},

@@ -4,6 +4,7 @@
 #include <algorithm>
 #include <utility>
 
+#include "player/FrameGate.h"
 #include "player/SinkTap.h"
 
 namespace engine {
@@ -72,6 +73,11 @@ bool Pipeline::isSeekable() const {
 
 void Pipeline::updateLatency() {
     gst_bin_recalculate_latency(GST_BIN(mParts.pipeline.get()));
+}
+
+void Pipeline::limitFrames(int displayRate) {
+    if (mParts.videoSink)
+        mProbes.push_back(engine::limitFrames(mParts.videoSink, displayRate));
 }
 
 std::string Pipeline::graph() const {

@@ -52,6 +52,9 @@ public:
     [[nodiscard]] bool isSeekable() const;
     void updateLatency();
 
+    /** Keeps more pictures a second from the sink. */
+    void limitFrames(int displayRate);
+
     /** The graph in Graphviz's dot format. */
     [[nodiscard]] std::string graph() const;
 

@@ -10,6 +10,7 @@
 #include "LibMediaPlayer/Result.h"
 #include "player/ChainTable.h"
 #include "player/FixedChain.h"
+#include "player/FrameGate.h"
 #include "player/PlaybinChain.h"
 
 namespace engine {
@@ -108,6 +109,11 @@ void Session::start(Pipeline::Parts parts) {
     mpPipeline.reset();
     mpPipeline = std::make_unique<Pipeline>(std::move(parts), nextPipelineNumber(), mpMailbox);
     mPlayback.attach(mpPipeline.get());
+    // Only a film that is known to be slow enough needs no watching.
+    const int display = displayRate(mpTicket->format());
+    const double film = mLook.video ? mLook.video->frameRate : 0;
+    if (film <= 0 || film > display)
+        mpPipeline->limitFrames(display);
     mLive = mpPipeline->setState(GST_STATE_PAUSED) == GST_STATE_CHANGE_NO_PREROLL;
     if (mLive)
         becomeReady();

@@ -25,19 +25,7 @@ struct IoContextTraits {
     }
 };
 
-struct DictionaryTraits {
-    using Pointer = AVDictionary*;
-    static void release(AVDictionary* dictionary) { av_dict_free(&dictionary); }
-};
-
-struct PacketTraits {
-    using Pointer = AVPacket*;
-    static void release(AVPacket* packet) { av_packet_free(&packet); }
-};
-
 using FormatContext = handle::UniqueHandle<FormatContextTraits>;
 using IoContext = handle::UniqueHandle<IoContextTraits>;
-using Dictionary = handle::UniqueHandle<DictionaryTraits>;
-using Packet = handle::UniqueHandle<PacketTraits>;
 
 } // namespace probe

@@ -70,7 +70,7 @@ constexpr std::string_view kFormats[] = {"aac",
                                          "wv",
                                          "yuv4mpegpipe"};
 
-constexpr std::string_view kPictures[] = {"apng",     "bmp_pipe",  "jpeg_pipe",
+constexpr std::string_view kPictures[] = {"apng",     "bmp_pipe",  "gif",      "jpeg_pipe",
                                           "png_pipe", "tiff_pipe", "webp_pipe"};
 
 /** Below it a few bytes agree by chance. */
@@ -135,7 +135,6 @@ private:
     void readOn();
     MediaLook describe();
     void describe(const AVStream& stream, MediaLook& look) const;
-    bool hasSecondPicture();
     LookResult failed(int result) const;
 
     static int isInterrupted(void* input) {
@@ -202,8 +201,7 @@ MediaLook Look::describe() {
     look.tagged = mTagged;
     for (unsigned int index = 0; index < mContext->nb_streams; ++index)
         describe(*mContext->streams[index], look);
-    look.still =
-        contains(kPictures, look.container) || (look.container == "gif" && !hasSecondPicture());
+    look.still = contains(kPictures, look.container);
     return look;
 }
 
@@ -228,16 +226,6 @@ void Look::describe(const AVStream& stream, MediaLook& look) const {
     default:
         return;
     }
-}
-
-bool Look::hasSecondPicture() {
-    const Packet packet(kAdopt, av_packet_alloc());
-    for (int count = 0; count < 2; ++count) {
-        if (av_read_frame(mContext.get(), packet.get()) < 0)
-            return false;
-        av_packet_unref(packet.get());
-    }
-    return true;
 }
 
 } // namespace
