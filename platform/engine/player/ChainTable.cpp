@@ -23,7 +23,7 @@ struct ContainerEntry {
 constexpr ContainerEntry kContainers[] = {
     {"mov,mp4,m4a,3gp,3g2,mj2", "qtdemux", Framing::kContainer},
     {"matroska,webm", "matroskademux", Framing::kContainer},
-    {"flv", "flvdemux", Framing::kContainer},
+    {"flv", "flvdemux", Framing::kParser},
     {"ogg", "oggdemux", Framing::kContainer},
     {"avi", "avidemux", Framing::kParser},
     {"mpegts", "tsdemux", Framing::kParser},
@@ -36,6 +36,9 @@ constexpr ContainerEntry kContainers[] = {
     {"jpeg_pipe", nullptr, Framing::kContainer},
     {"png_pipe", nullptr, Framing::kContainer},
     {"gif", nullptr, Framing::kContainer},
+    {"bmp_pipe", nullptr, Framing::kContainer},
+    {"tiff_pipe", nullptr, Framing::kContainer},
+    {"webp_pipe", nullptr, Framing::kContainer},
 };
 
 struct CodecEntry {
@@ -56,6 +59,9 @@ constexpr CodecEntry kCodecs[] = {
     {"mjpeg", nullptr, false, "jpegdec"},
     {"png", nullptr, false, "pngdec"},
     {"gif", nullptr, false, "gdkpixbufdec"},
+    {"bmp", nullptr, false, "gdkpixbufdec"},
+    {"tiff", nullptr, false, "gdkpixbufdec"},
+    {"webp", nullptr, false, "webpdec"},
     {"aac", "aacparse", false, "avdec_aac"},
     {"mp3", "mpegaudioparse", true, "mpg123audiodec"},
     {"mp2", "mpegaudioparse", true, "mpg123audiodec"},
@@ -89,6 +95,10 @@ bool planBranch(const std::optional<Stream>& stream, const ContainerEntry& conta
     return true;
 }
 
+bool isIndexed(const probe::MediaLook& look) {
+    return look.container != "mpegts" && look.container != "mpeg" && look.container != "flv";
+}
+
 } // namespace
 
 std::optional<ChainPlan> planChain(const probe::MediaLook& look, const PlayerOptions& options) {
@@ -109,8 +119,12 @@ std::optional<ChainPlan> planChain(const probe::MediaLook& look, const PlayerOpt
     return plan;
 }
 
+bool knowsKeyFrames(const probe::MediaLook& look) {
+    return look.video && isIndexed(look);
+}
+
 bool loopsSeamlessly(const probe::MediaLook& look) {
-    return look.container != "ogg" && look.container != "mpegts" && look.container != "mpeg";
+    return look.container != "ogg" && isIndexed(look);
 }
 
 } // namespace engine

@@ -25,6 +25,9 @@ struct ChainPlan {
 /** How to play what the look found; nothing when that is not among the common kinds. */
 std::optional<ChainPlan> planChain(const probe::MediaLook& look, const PlayerOptions& options);
 
+/** True when the container knows its key frames; elsewhere every seek is an accurate one. */
+bool knowsKeyFrames(const probe::MediaLook& look);
+
 /** True when a loop over such a container can be joined without a flush. */
 bool loopsSeamlessly(const probe::MediaLook& look);
 

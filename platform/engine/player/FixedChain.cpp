@@ -107,6 +107,7 @@ std::optional<Pipeline::Parts> Builder::build(const std::string& path) {
     }
     if (mFailed)
         return std::nullopt;
+    mParts.seekTarget = mPlan.audio ? mParts.audioSink : mParts.videoSink;
     if (!mPlan.container)
         entries.front()->media = {};
     connect(mLast, std::move(entries));

@@ -16,7 +16,8 @@ namespace engine {
  */
 class FrameGate {
 public:
-    explicit FrameGate(int displayRate) : mPeriod(std::chrono::seconds(1) / displayRate) {}
+    explicit FrameGate(int displayRate)
+        : mPeriod(Nanoseconds(std::chrono::seconds(1)) / displayRate) {}
 
     /** True when the frame of that time is to be shown. Times that step back begin anew. */
     bool passes(Nanoseconds time);

@@ -20,12 +20,6 @@ void Outlet::deliver(std::uint64_t session, Notification notification) {
         call(notification);
 }
 
-void Outlet::deliverLast(std::uint64_t session, Notification notification) {
-    const std::lock_guard lock(mDelivery);
-    if (mSession.compare_exchange_strong(session, session + 1))
-        call(notification);
-}
-
 void Outlet::call(Notification& notification) const {
     // A copy, because the function may set another one.
     if (const Function function = mFunction)

@@ -23,15 +23,18 @@ public:
 
     /** Begins a session: nothing of an earlier one is delivered from now on. */
     std::uint64_t beginSession() { return ++mSession; }
+
+    /** Nothing more of that session is delivered. */
+    void endSession(std::uint64_t session) {
+        mSession.compare_exchange_strong(session, session + 1);
+    }
+
     [[nodiscard]] bool isCurrent(std::uint64_t session) const { return mSession == session; }
 
     /** Waits for a notification that is being delivered, unless by this thread. */
     void drain();
 
     void deliver(std::uint64_t session, Notification notification);
-
-    /** The same as the last word of its session. */
-    void deliverLast(std::uint64_t session, Notification notification);
 
 private:
     void call(Notification& notification) const;

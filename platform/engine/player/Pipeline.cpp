@@ -38,8 +38,10 @@ GstState Pipeline::state() const {
 }
 
 bool Pipeline::seek(GstSeekFlags flags, Nanoseconds start, std::optional<Nanoseconds> stop) {
-    return gst_element_seek(mParts.pipeline.get(), 1.0, GST_FORMAT_TIME, flags, GST_SEEK_TYPE_SET,
-                            start.count(), GST_SEEK_TYPE_SET, stop ? stop->count() : -1) != FALSE;
+    GstEvent* const event =
+        gst_event_new_seek(1.0, GST_FORMAT_TIME, flags, GST_SEEK_TYPE_SET, start.count(),
+                           GST_SEEK_TYPE_SET, stop ? stop->count() : -1);
+    return gst_element_send_event(mParts.seekTarget.get(), event) != FALSE;
 }
 
 ClockAnchor Pipeline::anchor() const {

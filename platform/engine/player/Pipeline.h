@@ -27,6 +27,7 @@ public:
         gst::Element pipeline;
         gst::Element videoSink;
         gst::Element audioSink;
+        gst::Element seekTarget; ///< where seeks enter; by one sink they are made only once
         std::vector<gst::Signal> signals; ///< by which it builds itself
     };
 

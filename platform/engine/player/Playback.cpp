@@ -175,6 +175,15 @@ void Playback::onDurationChanged() {
     mReporter.setDuration(duration);
 }
 
+/** The message has undone the pipeline's change of state, so that it never tells of its end. */
+void Playback::onDecoderComplaint() {
+    if (!mReady)
+        return;
+    const bool settled = applyPlaying() == GST_STATE_CHANGE_SUCCESS;
+    if (settled && mFlight && mFlight->flushed)
+        finishSeek(kOk);
+}
+
 TimePoint Playback::deadline() const {
     if (mFlight)
         return mFlight->deadline;
@@ -232,8 +241,9 @@ void Playback::startSeek(Flight flight, int mode) {
     const auto stop = mSegmented ? mLoop->end : std::nullopt;
     mRoundEnd = stop;
     mLastEnd.reset();
-    const int landing = mode == kSeekKeyFrame ? GST_SEEK_FLAG_KEY_UNIT | GST_SEEK_FLAG_SNAP_NEAREST
-                                              : static_cast<int>(GST_SEEK_FLAG_ACCURATE);
+    const int landing = mode == kSeekKeyFrame && mMedium.keyFrames
+                            ? GST_SEEK_FLAG_KEY_UNIT | GST_SEEK_FLAG_SNAP_NEAREST
+                            : static_cast<int>(GST_SEEK_FLAG_ACCURATE);
     const int flags =
         GST_SEEK_FLAG_FLUSH | landing | (mSegmented ? static_cast<int>(GST_SEEK_FLAG_SEGMENT) : 0);
     if (!seekPipeline(flags, flight.target, stop))
@@ -308,8 +318,19 @@ void Playback::joinLoop() {
     if (mJoinHeld)
         return;
     ++mJoins;
-    mpPipeline->seek(static_cast<GstSeekFlags>(GST_SEEK_FLAG_SEGMENT | GST_SEEK_FLAG_ACCURATE),
-                     mLoop->start, mLoop->end);
+    seekPipeline(GST_SEEK_FLAG_SEGMENT | GST_SEEK_FLAG_ACCURATE, mLoop->start, mLoop->end);
+}
+
+/** The loop was ended while its last round was already being read: the rest follows. */
+void Playback::leaveLoop(Nanoseconds position) {
+    mSegmented = false;
+    if (mRoundEnd) {
+        seekPipeline(GST_SEEK_FLAG_ACCURATE, *mRoundEnd, std::nullopt);
+        return;
+    }
+    // That was all, and since it was a segment nobody tells when it has been played.
+    mLastEnd = position > timeline().last().position ? position : mMedium.duration;
+    refreshClock();
 }
 
 void Playback::passJoint() {
@@ -342,14 +363,14 @@ std::optional<Nanoseconds> Playback::watchedEnd() const {
     return mLoop && !mSegmented ? mLoop->end : std::nullopt;
 }
 
-void Playback::applyPlaying() {
-    mpPipeline->setState(mWantPlaying && !mBuffering ? GST_STATE_PLAYING : GST_STATE_PAUSED);
+GstStateChangeReturn Playback::applyPlaying() {
+    return mpPipeline->setState(mWantPlaying && !mBuffering ? GST_STATE_PLAYING : GST_STATE_PAUSED);
 }
 
 void Playback::startClock() {
     mRunning = true;
     mAnchor = mpPipeline->anchor();
-    mReporter.run(timeline(), mAnchor, watchedEnd());
+    mReporter.run(timeline(), mAnchor, mLoop ? mLoop->end : mLastEnd);
 }
 
 void Playback::stopClock() {

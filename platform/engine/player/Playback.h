@@ -32,6 +32,7 @@ public:
     struct Medium {
         bool still = false;     ///< a picture: time passes, but there is nothing to seek in
         bool live = false;      ///< does not wait for data, and cannot be stopped
+        bool keyFrames = true;  ///< they can be found
         bool seamless = false;  ///< loops can be joined without a flush
         Nanoseconds duration{}; ///< zero when unknown
     };
@@ -66,6 +67,9 @@ public:
     void onBuffering(int percent);
     void onDurationChanged();
 
+    /** A decoder has called an error what is none. */
+    void onDecoderComplaint();
+
     /** When onDeadline() wants to be called if nothing else happens. */
     [[nodiscard]] TimePoint deadline() const;
     void onDeadline();
@@ -99,7 +103,7 @@ private:
     [[nodiscard]] bool isPastLoop(Nanoseconds position) const;
     [[nodiscard]] std::optional<Nanoseconds> watchedEnd() const;
 
-    void applyPlaying();
+    GstStateChangeReturn applyPlaying();
     void startClock();
     void stopClock();
     void hold(Nanoseconds position);

@@ -25,6 +25,7 @@ unsigned int playbinFlags(const PlayerOptions& options) {
 Pipeline::Parts buildPlaybinChain(const std::string& uri, const PlayerOptions& options) {
     Pipeline::Parts parts;
     parts.pipeline = gst::makeElement("playbin3", "player");
+    parts.seekTarget = parts.pipeline;
     parts.videoSink = makeVideoSink(options.window);
     parts.audioSink = makeAudioSink();
     g_object_set(parts.pipeline.get(), "uri", uri.c_str(), "flags", playbinFlags(options),

@@ -9,6 +9,7 @@
 
 #include "LibMediaPlayer/Result.h"
 #include "player/Failure.h"
+#include "player/Reporter.h"
 #include "text/Text.h"
 
 namespace engine {
@@ -155,13 +156,10 @@ void Player::onOverdue(const std::shared_ptr<OpenTicket>& ticket, Watchdog::Over
     if (!ticket->claimAnswer())
         return;
     replaceEngine(false);
-    const Failure timedOut = failure(kTimedOut);
-    MediaPlayerNotify opened;
-    opened.type = kNotifyOpened;
-    opened.result = timedOut.result;
-    opened.text = timedOut.text;
-    mpFront->status.setState(ticket->session(), kFailed);
-    mpFront->outlet.deliverLast(ticket->session(), opened);
+    Reporter reporter(*mpFront, ticket->session());
+    reporter.tellFailure(kNotifyOpened, failure(kTimedOut));
+    reporter.setState(kFailed);
+    mpFront->outlet.endSession(ticket->session());
 }
 
 void Player::replaceEngine(bool keepOrders) {

@@ -56,6 +56,16 @@ void countStreams(GstStreamCollection* streams, probe::MediaLook& look) {
     }
 }
 
+/**
+ * Decoders call it an error when a seek near the end leaves them nothing to decode. What really
+ * keeps a stream from going on is told by the demuxer too.
+ */
+bool isDecoderComplaint(GstMessage* message) {
+    gst::Error details;
+    gst_message_parse_error(message, details.out(), nullptr);
+    return g_error_matches(details.get(), GST_STREAM_ERROR, GST_STREAM_ERROR_DECODE) != FALSE;
+}
+
 } // namespace
 
 Session::Session(Front& front, const PlayerOptions& options, std::shared_ptr<EngineMailbox> mailbox,
@@ -123,10 +133,17 @@ void Session::becomeReady() {
     mOpenDeadline = kNever;
     if (!mpTicket->claimAnswer())
         return;
-    const Nanoseconds duration = mLook.still ? Nanoseconds::zero() : mpPipeline->duration();
+    const Nanoseconds duration = findDuration();
     mReporter.setDuration(duration);
     tellOpened(duration);
-    mPlayback.begin({mLook.still, mLive, loopsSeamlessly(mLook), duration});
+    mPlayback.begin({mLook.still, mLive, knowsKeyFrames(mLook), loopsSeamlessly(mLook), duration});
+}
+
+Nanoseconds Session::findDuration() const {
+    if (mLook.still)
+        return Nanoseconds::zero();
+    const Nanoseconds told = mpPipeline->duration();
+    return told > Nanoseconds::zero() ? told : mLook.duration;
 }
 
 void Session::tellOpened(Nanoseconds duration) {
@@ -193,8 +210,10 @@ void Session::onError(GstMessage* message) {
     // What does not fit the plan may still be played.
     if (isOpening() && mFixed)
         openPlaybin();
-    else
+    else if (isOpening() || !isDecoderComplaint(message))
         fail(failureOf(message));
+    else
+        mPlayback.onDecoderComplaint();
 }
 
 void Session::onPrerolled() {

@@ -54,6 +54,7 @@ private:
     void openPlaybin();
     void start(Pipeline::Parts parts);
     void becomeReady();
+    [[nodiscard]] Nanoseconds findDuration() const;
     void tellOpened(Nanoseconds duration);
     void fail(const Failure& failure);
 

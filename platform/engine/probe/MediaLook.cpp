@@ -132,6 +132,7 @@ public:
 private:
     bool findFormat();
     int open();
+    [[nodiscard]] bool isClear() const;
     void readOn();
     MediaLook describe();
     void describe(const AVStream& stream, MediaLook& look) const;
@@ -152,7 +153,7 @@ LookResult Look::run() {
         return failed(kNotMedia);
     if (open() < 0)
         return failed(kDamaged);
-    if (mContext->nb_streams == 0 || (mContext->ctx_flags & AVFMTCTX_NOHEADER) != 0)
+    if (!isClear())
         readOn();
     if (mContext->nb_streams == 0)
         return failed(kDamaged);
@@ -189,6 +190,12 @@ int Look::open() {
     return error;
 }
 
+/** True when the file's header has told all. */
+bool Look::isClear() const {
+    return mContext->nb_streams > 0 && (mContext->ctx_flags & AVFMTCTX_NOHEADER) == 0 &&
+           (mContext->duration > 0 || contains(kPictures, mpFormat->name));
+}
+
 void Look::readOn() {
     mContext->probesize = 256 * 1024;
     mContext->max_analyze_duration = AV_TIME_BASE / 2;
@@ -201,6 +208,7 @@ MediaLook Look::describe() {
     look.tagged = mTagged;
     for (unsigned int index = 0; index < mContext->nb_streams; ++index)
         describe(*mContext->streams[index], look);
+    look.duration = std::chrono::microseconds(std::max<std::int64_t>(mContext->duration, 0));
     look.still = contains(kPictures, look.container);
     return look;
 }
