@@ -101,16 +101,14 @@ TEST_F(Shutdown, ByPowerOffEndsWhileAClientReadsNoAcknowledgements) {
     EXPECT_EQ(mpDaemon->waitForExit(), 0);
 }
 
-TEST_F(Shutdown, ByPowerOffEndsWithTheRequestsThatWereQueued) {
+TEST_F(Shutdown, ByPowerOffComesAfterTheRequestsBeforeIt) {
     PlayerClient client(1000);
     client.registerCallBack();
     for (int i = 0; i < 100; ++i)
         client.request(request::kPlay);
     client.request(request::kPowerOffMediaPlayer);
-    for (int i = 0; i < 100; ++i)
-        client.expectReply(callback::kPlay, 0);
-    EXPECT_TRUE(client.receive());
     EXPECT_EQ(mpDaemon->waitForExit(), 0);
+    EXPECT_THAT(mpDaemon->output().with("MediaPlayerService::play"), SizeIs(100));
 }
 
 TEST_F(Shutdown, ByPowerOffDuringInitializeWaitsForItsEnd) {
