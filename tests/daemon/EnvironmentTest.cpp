@@ -75,8 +75,10 @@ TEST_F(Environment, ALogDaemonThatStopsReadingHoldsUpNobody) {
 TEST_F(Environment, UnwritableLogFilesHarmNobody) {
     const std::vector<std::filesystem::path> files{"/var/log/qn_ope.log",
                                                    "/var/log/qn_ope_debug.log"};
-    for (const auto& file : files)
+    for (const auto& file : files) {
+        std::filesystem::remove(file);
         std::filesystem::create_directory(file);
+    }
     startServing(withEngineDouble());
     expectService();
     EXPECT_EQ(mpDaemon->terminate(), 0);

@@ -88,9 +88,8 @@ public:
     FileActions(const FileActions&) = delete;
     FileActions& operator=(const FileActions&) = delete;
 
-    void outputTo(int fd) {
-        ::posix_spawn_file_actions_adddup2(&mActions, fd, STDOUT_FILENO);
-        ::posix_spawn_file_actions_adddup2(&mActions, fd, STDERR_FILENO);
+    void replace(int standard, int fd) {
+        ::posix_spawn_file_actions_adddup2(&mActions, fd, standard);
     }
     void closeAll() {
         for (const int fd : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO})
@@ -142,22 +141,24 @@ bool lookUntil(Condition condition) {
 
 DaemonProcess::DaemonProcess(const DaemonOptions& options) {
     auto pipe = makePipe();
+    Pipe fullPipe;
     FileActions files;
-    if (options.output == DaemonOptions::Output::closed)
+    if (options.output == DaemonOptions::Output::closed) {
         files.closeAll();
-    else
-        files.outputTo(pipe.write.get());
-    if (options.output == DaemonOptions::Output::fullPipe)
-        fill(pipe.write.get());
-    mPid = spawn(options, files);
-    if (options.output == DaemonOptions::Output::captured) {
-        mRead = std::move(pipe.read);
-        ::fcntl(mRead.get(), F_SETFL, O_NONBLOCK);
-        mReader = std::thread(&DaemonProcess::readLoop, this);
     } else {
-        mFullPipe = std::move(pipe.read);
-        mOutput.close();
+        files.replace(STDOUT_FILENO, pipe.write.get());
+        files.replace(STDERR_FILENO, pipe.write.get());
     }
+    if (options.output == DaemonOptions::Output::fullPipe) {
+        fullPipe = makePipe();
+        fill(fullPipe.write.get());
+        files.replace(STDOUT_FILENO, fullPipe.write.get());
+    }
+    mPid = spawn(options, files);
+    mFullPipe = std::move(fullPipe.read);
+    mRead = std::move(pipe.read);
+    ::fcntl(mRead.get(), F_SETFL, O_NONBLOCK);
+    mReader = std::thread(&DaemonProcess::readLoop, this);
 }
 
 DaemonProcess::~DaemonProcess() {
@@ -236,8 +237,7 @@ void DaemonProcess::limitFreeDescriptors(std::size_t count) const {
 }
 
 const Lines& DaemonProcess::output() {
-    if (mRead)
-        readAvailable();
+    readAvailable();
     return mOutput;
 }
 

@@ -18,6 +18,7 @@
 
 /** How a daemon is started. */
 struct DaemonOptions {
+    /** Where standard output goes. Standard error goes with it, but not into the full pipe. */
     enum class Output { captured, closed, fullPipe };
 
     std::vector<std::string> arguments;
