@@ -3,12 +3,19 @@
 
 #include <optional>
 
-/**
- * Handles what the process is to do instead of serving: `--help` and `--version`. Returns the exit
- * status when that is all, and nothing when the daemon is to start. Other options are Qt's, and
- * an option that nobody knows is refused with status 2.
- */
-std::optional<int> runCommandLine(int argc, char** argv);
+struct CommandLine {
+    /** Set when the process is to end at once: help and version are printed, or an error is. */
+    std::optional<int> exitStatus;
 
-/** Whether the command line chooses Qt's window system. */
-bool choosesPlatform(int argc, char** argv);
+    /** Whether an option names Qt's window system. */
+    bool choosesPlatform = false;
+};
+
+/** Qt's own options are left to Qt. Anything that nobody knows ends with status 2. */
+CommandLine readCommandLine(int argc, char** argv);
+
+/**
+ * Where there is no display, and the environment names no window system of Qt, chooses one that
+ * draws nowhere. Call it while the process has one thread: it changes the environment.
+ */
+void choosePlatform();

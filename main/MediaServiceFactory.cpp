@@ -59,25 +59,29 @@ MediaServiceFactory::~MediaServiceFactory() {
     // Its threads call createProxy(), and its adapters end the services.
     mpRemoteReceiver.reset();
     mpIdleReceiver.reset();
-    if (mpThreadedReceiver == nullptr)
-        delete mpPlayerService;
 }
 
 bool MediaServiceFactory::initialize() {
     InstanceFactory::initialize();
     CSimpleBuffer().simplebuffer_system_init(kMinimumAllocateUnit, myMalloc, myFree);
-    mpIdleReceiver = std::make_unique<LTReceiver>(kThreadedReceiverId);
-    mpThreadedReceiver = mpIdleReceiver.get();
-    addPlayer();
-    return startServer();
+    if (mpThreadedReceiver == nullptr)
+        buildServices();
+    return mpRemoteReceiver != nullptr || startServer();
 }
 
-void MediaServiceFactory::addPlayer() {
-    if (mpPlayerService == nullptr)
-        mpPlayerService = new MediaPlayerService;
-    auto adapter = std::make_unique<MediaPlayerServiceAdapter>(kPlayerAdapterId);
+void MediaServiceFactory::buildServices() {
+    mpIdleReceiver = std::make_unique<LTReceiver>(kThreadedReceiverId);
+    mpThreadedReceiver = mpIdleReceiver.get();
+    addService<MediaPlayerServiceAdapter, MediaPlayerService>(kPlayerAdapterId, mpPlayerService);
+}
+
+template<class Adapter, class Service, class Interface>
+void MediaServiceFactory::addService(long adapterId, Interface*& service) {
+    if (service == nullptr)
+        service = new Service;
+    auto adapter = std::make_unique<Adapter>(adapterId);
     adapter->setProxyFactory(this);
-    adapter->setTarget(mpPlayerService);
+    adapter->setTarget(service);
     mpThreadedReceiver->addAdapter(adapter.release());
 }
 
@@ -86,7 +90,7 @@ bool MediaServiceFactory::startServer() {
     // Before the server listens, so that no packet comes too early for its receiver.
     server->addReceiver(mpIdleReceiver.release());
     if (!server->initialize(kServiceIdentity)) {
-        server->releaseReceiver(kThreadedReceiverId).release();
+        server->releaseReceiver(kThreadedReceiverId).release(); // the same object, by its base
         mpIdleReceiver.reset(mpThreadedReceiver);
         return false;
     }

@@ -21,13 +21,19 @@ public:
     MediaServiceFactory();
     ~MediaServiceFactory() override;
 
-    /** Builds receiver, services, adapters and server. False when the server could not start. */
+    /**
+     * Builds receiver, services, adapters and server. False when the server could not start; all
+     * else stays, and another call tries to start the server again.
+     */
     bool initialize() override;
 
     /** No objects are made by id here. */
     void createInstance(long id, void** instance) override;
 
-    /** Puts `service` in the place of the one that initialize() would make. Takes ownership. */
+    /**
+     * Puts `service`, an IMediaPlayerService for id 62, in the place of the one that initialize()
+     * would make. The first one stays; other ids are ignored. initialize() takes ownership.
+     */
     virtual void RegisterObject(long id, void* service);
 
     /** Adapters are made in initialize() only: null. */
@@ -41,11 +47,13 @@ public:
     PTC::IProxyBase* createProxy(long interfaceId, long proxyId, long clientIdentity) override;
 
 private:
-    void addPlayer();
+    template<class Adapter, class Service, class Interface>
+    void addService(long adapterId, Interface*& service);
+    void buildServices();
     bool startServer();
     PTC::ISender* senderFor(long clientIdentity);
 
-    IMediaPlayerService* mpPlayerService = nullptr; ///< its adapter owns it once there is one
+    IMediaPlayerService* mpPlayerService = nullptr; ///< owned by its adapter
     LTReceiver* mpThreadedReceiver = nullptr;       ///< owned by one of the next two
     std::unique_ptr<LTReceiver> mpIdleReceiver;     ///< while no server runs
 };

@@ -22,9 +22,8 @@ bool PowerOff::waitPowerOff() {
         return true;
     try {
         boost::mutex::scoped_lock lock(mMutex);
-        // Any wake-up ends the wait: whoever waits here acts on it by looking at the system.
-        mCondition.wait(lock);
-    } catch (...) {
+        mCondition.wait(lock); // once: see the header
+    } catch (...) {            // an interruption is thrown, and is no std::exception
         return false;
     }
     return true;

@@ -13,11 +13,13 @@ class PowerOff {
 public:
     virtual ~PowerOff() = default;
 
-    /** The process's instance, made at the first call and never deleted; null when out of memory.
-     */
+    /** The process's instance, made at the first call, never deleted; null when that fails. */
     static PowerOff* getInstance();
 
-    /** Blocks until power-off is announced. False when the waiting thread was interrupted. */
+    /**
+     * Blocks until power-off is announced; at once when it has been. Any wake-up counts as one.
+     * False when the waiting thread was interrupted.
+     */
     bool waitPowerOff();
 
     /** Announces power-off. */
@@ -26,7 +28,7 @@ public:
     void cleanUp();
 
 private:
-    boost::mutex mMutex;
+    boost::mutex mMutex; ///< guards the wait, not the flag
     boost::condition_variable mCondition;
     std::atomic<bool> mbPowerOff{false};
 

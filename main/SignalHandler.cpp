@@ -10,7 +10,9 @@
 #include <syslog.h>
 #include <thread>
 #include <unistd.h>
+#include <utility>
 
+#include "ptc/Barrier.h"
 #include "qnsys.h"
 
 namespace {
@@ -46,12 +48,28 @@ std::atomic<const char**> g_SignalMsgTable{nullptr};
 /** From the handler to the thread that runs the callback: one byte for every signal. */
 int gSignalPipe[2] = {-1, -1};
 
+void runCallback() {
+    if (void (*callback)() = g_pCallBackFun)
+        callback();
+}
+
 [[noreturn]] void crash() {
     qnsys_print_backtrace();
     // Not freed: the heap may be what has broken.
     g_SignalMsgTable = nullptr;
     g_bIsInited = false;
     std::abort();
+}
+
+void passOn(int sig) {
+    if (gSignalPipe[1] < 0) { // there is no thread: better in the handler than not at all
+        runCallback();
+        return;
+    }
+    const int savedErrno = errno;
+    const char byte = static_cast<char>(sig);
+    [[maybe_unused]] const ssize_t written = ::write(gSignalPipe[1], &byte, 1);
+    errno = savedErrno;
 }
 
 void handleSignal(int sig) {
@@ -64,43 +82,40 @@ void handleSignal(int sig) {
     case SIGSEGV:
         crash();
     case SIGINT:
-    case SIGTERM: {
-        const int savedErrno = errno;
-        const char byte = static_cast<char>(sig);
-        [[maybe_unused]] const ssize_t written = ::write(gSignalPipe[1], &byte, 1);
-        errno = savedErrno;
+    case SIGTERM:
+        passOn(sig);
         return;
-    }
     default:
         return;
     }
 }
 
-/** Runs the callback for every signal that the handler tells of. */
+/** Runs the callback for every signal that the handler tells of, as long as the process lives. */
 void runCallbacks() {
     char byte;
-    for (;;) {
-        const ssize_t count = ::read(gSignalPipe[0], &byte, 1);
-        if (count < 0 && errno == EINTR)
-            continue;
-        if (count <= 0)
-            return;
-        if (void (*callback)() = g_pCallBackFun)
-            callback();
-    }
+    while (::read(gSignalPipe[0], &byte, 1) == 1)
+        runCallback();
 }
 
-/** The thread takes no signals itself, and lives as long as the process. */
-void startCallbackThread() {
-    if (::pipe2(gSignalPipe, O_CLOEXEC) != 0)
-        return;
-    ::fcntl(gSignalPipe[1], F_SETFL, O_NONBLOCK); // a handler never waits
+/** It takes no signals itself, so that no read is interrupted. */
+bool startThreadWithoutSignals(void (*body)()) {
     sigset_t all;
     sigset_t before;
     sigfillset(&all);
     pthread_sigmask(SIG_SETMASK, &all, &before);
-    std::thread(runCallbacks).detach();
+    const bool started = PTC::barrier([body] { std::thread(body).detach(); });
     pthread_sigmask(SIG_SETMASK, &before, nullptr);
+    return started;
+}
+
+void startCallbackThread() {
+    if (::pipe2(gSignalPipe, O_CLOEXEC) != 0)
+        return;
+    ::fcntl(gSignalPipe[1], F_SETFL, O_NONBLOCK); // a handler never waits
+    if (startThreadWithoutSignals(runCallbacks))
+        return;
+    for (int& end : gSignalPipe)
+        ::close(std::exchange(end, -1));
 }
 
 const char* messageOf(int number) {

@@ -3,17 +3,25 @@
 
 #include <QCoreApplication>
 #include <arpa/inet.h>
+#include <chrono>
+#include <future>
 #include <gmock/gmock.h>
+#include <memory>
 #include <netinet/in.h>
 #include <poll.h>
 #include <sys/socket.h>
 
 #include "base/UniqueFd.h"
 #include "define/ObjectIds.h"
+#include "define/PlayerMethods.h"
+#include "player/IMediaPlayerService.h"
+#include "player/IMediaPlayerServiceNotify.h"
 #include "player/MediaPlayerServiceCallBackRemoteProxy.h"
 #include "player/MediaPlayerServiceNotifyRemoteProxy.h"
+#include "ptc/Event.h"
 #include "ptc/IProxy.h"
 #include "ptc/ISender.h"
+#include "ptc/SocketRemoteSender.h"
 
 using namespace MediaServiceDefine;
 
@@ -53,13 +61,15 @@ protected:
 };
 
 TEST(ModuleIds, FollowTheTable) {
-    EXPECT_EQ(toModuleId(1000), 1);
-    EXPECT_EQ(toModuleId(1005), 6);
+    for (long identity = 1000; identity <= 1005; ++identity)
+        EXPECT_EQ(toModuleId(identity), identity - 999);
     EXPECT_EQ(toModuleId(1006), 8);
     EXPECT_EQ(toModuleId(1007), 7);
     EXPECT_EQ(toModuleId(999), 8);
     EXPECT_EQ(toModuleId(1008), 8);
+    EXPECT_EQ(toModuleId(0), 8);
     EXPECT_EQ(toModuleId(-1), 8);
+    static_assert(toModuleId(1007) == 7);
 }
 
 TEST_F(Factory, MakesNoProxyOfAnUnknownInterface) {
@@ -110,16 +120,103 @@ TEST_F(Factory, MakesNothingById) {
     EXPECT_EQ(mFactory.getRRIdentity(), -1);
 }
 
-TEST_F(Factory, ServesAtItsPortOnceInitialised) {
-    int argc = 0;
-    const QCoreApplication application(argc, nullptr);
+TEST_F(Factory, MakesNoProxiesOfServicesThatItDoesNotHave) {
+    ClientPort client(1000);
+    for (const long interfaceId :
+         {kDiscovererCallBackId, kImporterCallBackId, kImporterNotifyId, kPlayerAdapterId, 0L})
+        EXPECT_EQ(mFactory.createProxy(interfaceId, 1, 1000), nullptr) << interfaceId;
+    EXPECT_EQ(client.connections(), 0);
+}
+
+/** A factory that serves; services need the application's event loop to be there. */
+class ServingFactory : public ::testing::Test {
+protected:
+    int mArgc = 0;
+    const QCoreApplication mApplication{mArgc, nullptr};
+    MediaServiceFactory mFactory;
+};
+
+TEST_F(ServingFactory, ServesAtItsPortOnceInitialised) {
     EXPECT_TRUE(mFactory.initialize());
     EXPECT_EQ(mFactory.getRRIdentity(), 1008);
-    MediaServiceFactory second;
+}
+
+TEST_F(ServingFactory, WithoutItsPortSaysSoAndServesWhenTriedAgain) {
+    auto other = std::make_unique<ClientPort>(1008);
     ::testing::internal::CaptureStdout();
-    EXPECT_FALSE(second.initialize());
+    EXPECT_FALSE(mFactory.initialize());
     EXPECT_EQ(::testing::internal::GetCapturedStdout(), "[Error]Socket Server create failed!\n");
-    EXPECT_EQ(second.getRRIdentity(), -1);
+    EXPECT_EQ(mFactory.getRRIdentity(), -1);
+    other.reset();
+    EXPECT_TRUE(mFactory.initialize());
+    EXPECT_EQ(mFactory.getRRIdentity(), 1008);
+}
+
+TEST_F(ServingFactory, MayBeInitializedTwice) {
+    EXPECT_TRUE(mFactory.initialize());
+    EXPECT_TRUE(mFactory.initialize());
+    EXPECT_EQ(mFactory.getRRIdentity(), 1008);
+}
+
+/** Tells which requests come, and its end. */
+class PlayerDouble : public IMediaPlayerService {
+public:
+    explicit PlayerDouble(bool& isDeleted) : mIsDeleted(isDeleted) {}
+    ~PlayerDouble() override { mIsDeleted = true; }
+
+    void initializePlayer(int) override {}
+    void openPlayer(_tagFileName) override {}
+    void closePlayer(int) override {}
+    void play(int) override { mPlayed.set_value(); }
+    void pause(int) override {}
+    void seek(_tagSeekParam) override {}
+    void getPlayerStatus(int) override {}
+    void setRepeat(_tagRepeatParam) override {}
+    void powerOffMediaPlayer(int) override {}
+    void registerCallBack(IMediaPlayerServiceCallBack*) override {}
+    void registerNotify(_tagIMediaPlayerServiceNotify) override {}
+    void unregisterCallBack(int) override {}
+    void unregisterNotify(int) override {}
+    void setSystemFormat(_emMediaServiceSystemFormat) override {}
+
+    std::future<void> played() { return mPlayed.get_future(); }
+
+private:
+    bool& mIsDeleted;
+    std::promise<void> mPlayed;
+};
+
+void* asService(IMediaPlayerService* service) {
+    return service;
+}
+
+TEST(RegisteredService, OfTheFirstRegistrationIsServedAndDeletedWithTheFactory) {
+    bool isDeleted = false;
+    {
+        MediaServiceFactory factory;
+        auto* player = new PlayerDouble(isDeleted);
+        auto played = player->played();
+        factory.RegisterObject(kPlayerAdapterId, asService(player));
+        factory.RegisterObject(kPlayerAdapterId, &factory);     // comes too late
+        factory.RegisterObject(kDiscovererAdapterId, &factory); // there is no such service
+        ASSERT_TRUE(factory.initialize());
+
+        SocketRemoteSender client(kThreadedReceiverId);
+        ASSERT_TRUE(client.initialize(kServiceIdentity));
+        char clientId = 1; // as it is encoded
+        client.send(new PTC::Event(kPlayerAdapterId, static_cast<long>(PlayerMethod::play),
+                                   &clientId, sizeof clientId, true, false));
+        EXPECT_EQ(played.wait_for(std::chrono::seconds(30)), std::future_status::ready);
+        EXPECT_FALSE(isDeleted);
+    }
+    EXPECT_TRUE(isDeleted);
+}
+
+TEST(RegisteredService, IsItsOwnersUntilTheFactoryIsInitialised) {
+    bool isDeleted = false;
+    PlayerDouble player(isDeleted);
+    { MediaServiceFactory().RegisterObject(kPlayerAdapterId, asService(&player)); }
+    EXPECT_FALSE(isDeleted);
 }
 
 } // namespace

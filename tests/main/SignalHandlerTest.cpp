@@ -2,6 +2,7 @@
 #include "main/SignalHandler.h"
 
 #include <array>
+#include <cerrno>
 #include <csignal>
 #include <gmock/gmock.h>
 #include <string>
@@ -9,7 +10,10 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include "log/Logging.h"
+#include "main/SystemSingleCaught.h"
 #include "qnsys.h"
+#include "tests/tools/LogSocket.h"
 
 using ::testing::HasSubstr;
 
@@ -59,6 +63,23 @@ void exitWithSeven() {
 
 void exitWithEight() {
     ::_exit(8);
+}
+
+struct sigaction actionOf(int signal) {
+    struct sigaction action {};
+    ::sigaction(signal, nullptr, &action);
+    return action;
+}
+
+auto handlerOf(int signal) {
+    return actionOf(signal).sa_handler;
+}
+
+bool isCaughtPlainly(int signal) {
+    constexpr int kFlags = SA_RESTART | SA_NODEFER | SA_RESETHAND | SA_SIGINFO | SA_ONSTACK;
+    const struct sigaction action = actionOf(signal);
+    return action.sa_handler != SIG_DFL && action.sa_handler != SIG_IGN &&
+           (action.sa_flags & kFlags) == 0 && sigisemptyset(&action.sa_mask);
 }
 
 [[noreturn]] void waitForTheEnd() {
@@ -140,6 +161,66 @@ TEST(SignalHandler, LeavesSignalsBeyondItsTableAlone) {
     });
     EXPECT_TRUE(WIFSIGNALED(outcome.status));
     EXPECT_EQ(WTERMSIG(outcome.status), SIGXCPU);
+}
+
+TEST(SignalHandler, IsInstalledForTheTableAloneWithoutFlagsAndMask) {
+    const Outcome outcome = inChild([] {
+        registerSystemSignalHandler(nullptr, "test");
+        constexpr int kCaught[] = {SIGSEGV, SIGBUS,  SIGFPE, SIGQUIT, SIGTERM, SIGINT,
+                                   SIGALRM, SIGPIPE, SIGPWR, SIGUSR1, SIGUSR2};
+        for (const int signal : kCaught)
+            if (!isCaughtPlainly(signal))
+                ::_exit(signal);
+        for (const int signal : {SIGHUP, SIGCHLD, SIGXCPU, SIGTSTP})
+            if (handlerOf(signal) != SIG_DFL)
+                ::_exit(signal);
+    });
+    EXPECT_EQ(outcome.status, 0);
+}
+
+TEST(SignalHandler, IsNotInstalledAgainByASecondRegistration) {
+    const Outcome outcome = inChild([] {
+        registerSystemSignalHandler(exitWithSeven, "test");
+        ::signal(SIGTERM, SIG_IGN);
+        registerSystemSignalHandler(exitWithEight, "test");
+        ::_exit(handlerOf(SIGTERM) == SIG_IGN ? 0 : 1);
+    });
+    EXPECT_EQ(outcome.status, 0);
+}
+
+TEST(SignalHandler, LeavesTheErrorNumberAlone) {
+    const Outcome outcome = inChild([] {
+        registerSystemSignalHandler(nullptr, "test");
+        errno = ERANGE;
+        for (int i = 0; i < 100'000; ++i) // more than the way to the callback has room for
+            ::raise(SIGTERM);
+        ::_exit(errno == ERANGE ? 0 : 1);
+    });
+    EXPECT_EQ(outcome.status, 0);
+}
+
+TEST(SignalHandler, TakesAnyProcessName) {
+    const Outcome outcome = inChild([] {
+        registerSystemSignalHandler(exitWithSeven, nullptr);
+        ::raise(SIGTERM);
+        waitForTheEnd();
+    });
+    EXPECT_EQ(WEXITSTATUS(outcome.status), 7);
+}
+
+TEST(SystemSingleCaught, EndsAProcessWhoseMainThreadIsBusyAndLogsOneLineForTwoSignals) {
+    LogSocket log;
+    const Outcome outcome = inChild([] {
+        INIT_LOGGING(L"MediaPlayerService");
+        registerSystemSignalHandler(onSystemSingleCaught, "QNSMediaService");
+        ::raise(SIGTERM);
+        ::raise(SIGINT);
+        waitForTheEnd();
+    });
+    EXPECT_TRUE(WIFEXITED(outcome.status));
+    EXPECT_EQ(WEXITSTATUS(outcome.status), 0);
+    EXPECT_EQ(log.nextMessage(), "MediaPlayerService 101: main::onSystemSingleCaught");
+    EXPECT_EQ(log.waiting(), std::nullopt);
 }
 
 } // namespace
