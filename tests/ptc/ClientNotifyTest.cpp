@@ -1,11 +1,11 @@
 // SPDX-License-Identifier: MIT
 #include "ptc/ClientNotify.h"
 
+#include <gtest/gtest.h>
+
 #include <set>
 #include <thread>
 #include <vector>
-
-#include <gtest/gtest.h>
 
 namespace {
 

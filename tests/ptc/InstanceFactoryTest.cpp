@@ -1,15 +1,15 @@
 // SPDX-License-Identifier: MIT
 #include "ptc/InstanceFactory.h"
 
-#include <functional>
-#include <string>
-#include <vector>
-
-#include <gtest/gtest.h>
-
 #include "ptc/CallbackProxy.h"
 #include "ptc/IRemoteReceiver.h"
 #include "ptc/ISender.h"
+
+#include <gtest/gtest.h>
+
+#include <functional>
+#include <string>
+#include <vector>
 
 namespace {
 

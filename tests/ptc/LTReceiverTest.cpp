@@ -1,23 +1,18 @@
 // SPDX-License-Identifier: MIT
 #include "ptc/LTReceiver.h"
 
-#include <chrono>
-#include <csignal>
-#include <cstdlib>
-#include <filesystem>
-#include <future>
-#include <memory>
-#include <stdexcept>
-#include <string>
-#include <sys/syscall.h>
-#include <thread>
-#include <unistd.h>
-#include <vector>
+#include "tests/ptc/Gate.h"
+#include "tests/ptc/ProcessState.h"
+#include "tests/ptc/TestAdapter.h"
 
 #include <gtest/gtest.h>
 
-#include "tests/ptc/Gate.h"
-#include "tests/ptc/TestAdapter.h"
+#include <chrono>
+#include <future>
+#include <memory>
+#include <stdexcept>
+#include <thread>
+#include <vector>
 
 using namespace std::chrono_literals;
 
@@ -27,21 +22,6 @@ namespace {
 void waitForWorker(LTReceiver& receiver, long lastMethod, const Gate& last) {
     receiver.recv(makeEvent(1, lastMethod).release());
     ASSERT_TRUE(last.wait());
-}
-
-void nothingToDo(int) {}
-
-/** Runs a signal handler on every other thread of the process. */
-void interruptOtherThreads() {
-    struct sigaction action {};
-    action.sa_handler = nothingToDo;
-    ASSERT_EQ(sigaction(SIGUSR1, &action, nullptr), 0);
-    const auto self = static_cast<pid_t>(syscall(SYS_gettid));
-    for (const auto& task : std::filesystem::directory_iterator("/proc/self/task")) {
-        const auto thread = static_cast<pid_t>(std::stol(task.path().filename()));
-        if (thread != self)
-            syscall(SYS_tgkill, getpid(), thread, SIGUSR1);
-    }
 }
 
 } // namespace

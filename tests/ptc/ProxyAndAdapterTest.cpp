@@ -1,13 +1,13 @@
 // SPDX-License-Identifier: MIT
-#include <memory>
-
-#include <gmock/gmock.h>
-
 #include "ptc/Adapter.h"
 #include "ptc/CallbackProxy.h"
 #include "ptc/Event.h"
 #include "ptc/IFactory.h"
 #include "ptc/ISender.h"
+
+#include <gmock/gmock.h>
+
+#include <memory>
 
 using testing::Return;
 using testing::StrictMock;

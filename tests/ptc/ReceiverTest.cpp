@@ -1,11 +1,11 @@
 // SPDX-License-Identifier: MIT
 #include "ptc/Receiver.h"
 
-#include <stdexcept>
+#include "tests/ptc/TestAdapter.h"
 
 #include <gtest/gtest.h>
 
-#include "tests/ptc/TestAdapter.h"
+#include <stdexcept>
 
 using PTC::Receiver;
 

@@ -1,15 +1,15 @@
 // SPDX-License-Identifier: MIT
-#include <functional>
-#include <string>
-#include <vector>
-
-#include <gtest/gtest.h>
-
 #include "ptc/EventPacket.h"
 #include "ptc/Receiver.h"
 #include "ptc/RemoteReceiver.h"
 #include "ptc/RemoteSender.h"
 #include "tests/ptc/TestAdapter.h"
+
+#include <gtest/gtest.h>
+
+#include <functional>
+#include <string>
+#include <vector>
 
 namespace {
 

@@ -1,19 +1,19 @@
 // SPDX-License-Identifier: MIT
 #include "ptc/ServiceAdapter.h"
 
-#include <cstring>
-#include <memory>
-#include <string>
-#include <vector>
-
-#include <gmock/gmock.h>
-
 #include "define/RegistrationInfo.h"
 #include "pack/PackedArguments.h"
 #include "ptc/CallbackProxy.h"
 #include "ptc/CallbackReply.h"
 #include "ptc/IFactory.h"
 #include "ptc/ISender.h"
+
+#include <gmock/gmock.h>
+
+#include <cstring>
+#include <memory>
+#include <string>
+#include <vector>
 
 using testing::Mock;
 using testing::Return;

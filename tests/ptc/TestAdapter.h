@@ -1,13 +1,13 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include "ptc/Event.h"
+#include "ptc/IAdapter.h"
+
 #include <functional>
 #include <memory>
 #include <string_view>
 #include <utility>
-
-#include "ptc/Event.h"
-#include "ptc/IAdapter.h"
 
 /** An adapter whose behaviour is a function of the test. */
 class TestAdapter : public PTC::IAdapterBase {
