@@ -7,7 +7,10 @@ namespace PTC {
 
 class IProxyBase;
 
-/** Base of the service adapters: their id and their access to the proxy factory. */
+/**
+ * Base of the service adapters: their id and their access to the proxy factory. Called by the
+ * thread that dispatches events, and set up before the first of them.
+ */
 class Adapter : public IAdapter {
 public:
     explicit Adapter(long id);

@@ -7,7 +7,7 @@ namespace PTC {
 
 /**
  * Base of senders. Its id is the id of the receiver in the other process, its identity the
- * loopback port at which that process listens.
+ * loopback port at which that process listens. Both are set before other threads send.
  */
 class RemoteSender : public IRemoteSender {
 public:

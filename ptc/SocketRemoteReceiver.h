@@ -19,7 +19,11 @@
  * complete packet to the receiver that the packet names.
  *
  * Threads: one listener, and one reader per connection. A connection's resources are released by
- * the listener as soon as its reader has ended. The destructor stops and joins them all.
+ * the listener as soon as its reader has ended. The destructor stops and joins them all, and
+ * deletes the receivers after that; it must not run on one of those threads.
+ *
+ * initialize() belongs to the thread that owns the server. The operations that say whose they
+ * are belong to the server's own threads. The rest may be called by any.
  */
 class SocketRemoteReceiver : public PTC::RemoteReceiver {
 public:
@@ -31,23 +35,33 @@ public:
     SocketRemoteReceiver(long id, ErrorReporter report);
     ~SocketRemoteReceiver() override;
 
-    /** Binds port `identity` and starts listening. Add the receivers before. */
+    /**
+     * Binds port `identity` and starts listening. Add the receivers before.
+     * False when that fails, after one reported line, or when the server runs already.
+     */
     bool initialize(long identity) override;
+    /** Does nothing: initialize() starts the server. */
     void run() override;
 
     /** Descriptor of the connection accepted last, -1 at first. */
     [[nodiscard]] int getLastClientSocket() const;
+    /** Whether a read with this result, -1 or 0, was the last of its connection. */
     [[nodiscard]] bool isRecvDataFailed(int result) const;
+    /** True when the acknowledgement was sent. */
     bool sendACK(int socket);
 
-    /** The listener's loop. */
+    /** The listener's loop. 0 when the server stops, -1 when the loop cannot go on. */
     int waitClientLink();
+    /** The listener's: starts a reader for `socket`, which it takes over. 0, or -1 on failure. */
     int addClientThread(int socket);
 
-    /** A reader's loop, on the connection accepted last. */
+    /** A reader's loop, on the connection accepted last. 0 at its end, -1 without memory. */
     int ThreadMain();
 
-    /** Delivers the event of one complete packet. */
+    /**
+     * Delivers the event of one complete packet of kPacketSize bytes. A packet without payload,
+     * with one larger than fits, or for a receiver that is not there is ignored.
+     */
     void executePacket(const char* buffer);
 
 private:

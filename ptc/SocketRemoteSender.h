@@ -13,9 +13,9 @@
 /**
  * Sends events to a process of this machine, one packet each. Any thread may call send().
  *
- * A packet is written whole or not at all: a peer that takes nothing for two seconds is given up,
- * and what is sent to it afterwards is dropped at once. Nothing of this is reported, and there
- * is no reconnect.
+ * Packets never mix. A peer that has not taken one within two seconds is given up: its
+ * connection ends there, and what is sent afterwards is dropped at once. Nothing of this is
+ * reported, and there is no reconnect.
  */
 class SocketRemoteSender : public PTC::RemoteSender {
 public:
@@ -23,7 +23,7 @@ public:
     explicit SocketRemoteSender(long moduleId);
     ~SocketRemoteSender() override;
 
-    /** Connects to 127.0.0.1, port `identity`. */
+    /** Connects to 127.0.0.1, port `identity`, within two seconds. */
     bool initialize(long identity) override;
 
     /** 0, or the result of the call that failed. */

@@ -3,6 +3,7 @@
 
 #include "ptc/Event.h"
 #include "ptc/LTReceiver.h"
+#include "ptc/LoopbackSocket.h"
 #include "ptc/SocketRemoteReceiver.h"
 #include "tests/ptc/Eventually.h"
 #include "tests/ptc/Gate.h"
@@ -249,9 +250,24 @@ TEST_F(DeafPeer, GetsNothingAfterThePacketThatWasCutShort) {
     sendUntilGivenUp();
     auto peer = mClient.accept();
     const auto bytes = peer.readAll();
+    EXPECT_TRUE(peer.isClosedByOther());
     EXPECT_LT(bytes.size(), static_cast<std::size_t>(mSent) * PTC::kPacketSize);
     for (std::size_t at = 0; at + PTC::kPacketSize <= bytes.size(); at += PTC::kPacketSize)
         EXPECT_EQ(payloadOf(bytes.substr(at, PTC::kPacketSize)), std::string(1000, 'x'));
+}
+
+TEST_F(DeafPeer, IsServedWhenItReadsOnlyOnceItsAcknowledgementsAreTaken) {
+    constexpr long kPackets = 5;
+    auto peer = mClient.accept();
+    for (const int socket : {mSender.socket(), peer.socket()})
+        ASSERT_EQ(PTC::setSocketOption(socket, SOL_SOCKET, SO_SNDBUF, 1), 0);
+    auto sending = std::async(std::launch::async, [this] {
+        for (long method = 0; method < kPackets; ++method)
+            send(mSender, method, std::string(PTC::kMaxPayloadSize, 'x'));
+    });
+    ASSERT_TRUE(peer.write(std::string(2000000, 'O')));
+    for (long method = 0; method < kPackets; ++method)
+        EXPECT_EQ(headerOf(peer.read(PTC::kPacketSize)).methodId, method);
 }
 
 TEST_F(DeafPeer, HoldsNobodyElseUp) {
