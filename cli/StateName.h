@@ -18,6 +18,8 @@ constexpr const char* stateName(qnsmedia::PlayerState state) {
         return "ended";
     case qnsmedia::PlayerState::failed:
         return "failed";
+    case qnsmedia::PlayerState::unknown:
+        break;
     }
     return "unknown";
 }

@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: MIT
 #include "qnsmedia/Connection.h"
 
+#include <utility>
+
 #include "client/src/Link.h"
 
 namespace qnsmedia {
@@ -21,6 +23,10 @@ bool Connection::alive() const {
 
 void Connection::onLost(std::function<void()> handler) {
     mpLink->onLost(std::move(handler));
+}
+
+void Connection::onError(std::function<void(std::exception_ptr)> handler) {
+    mpLink->onError(std::move(handler));
 }
 
 } // namespace qnsmedia

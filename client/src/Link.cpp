@@ -2,50 +2,54 @@
 #include "client/src/Link.h"
 
 #include <algorithm>
-#include <arpa/inet.h>
 #include <cerrno>
-#include <netinet/in.h>
 #include <poll.h>
 #include <sys/eventfd.h>
 #include <sys/socket.h>
-#include <utility>
 
-#include "client/src/CallbackAdapter.h"
 #include "define/ObjectIds.h"
+#include "ptc/Barrier.h"
 #include "ptc/Event.h"
+#include "ptc/EventPacket.h"
 #include "ptc/LTReceiver.h"
+#include "ptc/LoopbackSocket.h"
 #include "qnsmedia/Error.h"
 
 using namespace MediaServiceDefine;
+using std::chrono::milliseconds;
 
 namespace qnsmedia {
 namespace {
 
-/** Objects that one process can have; a player takes two. */
-constexpr long kObjectCount = 64;
+constexpr milliseconds kShortestDeadline{1};
+constexpr milliseconds kLongestDeadline = std::chrono::hours(24);
 
 template<typename Failure>
 std::exception_ptr failure(const std::string& text) {
     return std::make_exception_ptr(Failure(text));
 }
 
-std::exception_ptr lostFailure(const std::string& what) {
+std::exception_ptr lost(const std::string& what) {
     return failure<ConnectionLost>(what + ": the connection to the daemon is lost");
 }
 
-/** Whether another process has the port: known beforehand, so that nothing is printed. */
+std::exception_ptr overdue(const std::string& what) {
+    return failure<TimedOut>(what + ": the daemon gave no answer");
+}
+
+std::exception_ptr released(const std::string& what) {
+    return failure<ConnectionLost>(what + ": given up, no answer had come yet");
+}
+
+/** Whether nobody has the port: known beforehand, to tell a taken one from a forbidden one. */
 bool isFree(int port) {
     const qns::UniqueFd socket(::socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0));
-    const int one = 1;
-    ::setsockopt(socket.get(), SOL_SOCKET, SO_REUSEADDR, &one, sizeof one);
-    sockaddr_in address{};
-    address.sin_family = AF_INET;
-    address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
-    address.sin_port = htons(static_cast<uint16_t>(port));
+    PTC::setSocketOption(socket.get(), SOL_SOCKET, SO_REUSEADDR, 1);
+    const sockaddr_in address = PTC::loopbackAddress(port);
     if (::bind(socket.get(), reinterpret_cast<const sockaddr*>(&address), sizeof address) == 0)
         return true;
-    if (errno == EACCES)
-        throw Error("no permission to use the loopback ports 1000 to 1007");
+    if (errno != EADDRINUSE)
+        throw Error("this process may not use the loopback port " + std::to_string(port));
     return false;
 }
 
@@ -53,6 +57,10 @@ bool isFree(int port) {
 
 Link::Link(const Connection::Options& options)
     : mDeadline(options.deadline), mWakeUp(::eventfd(0, EFD_CLOEXEC | EFD_NONBLOCK)) {
+    if (mDeadline < kShortestDeadline || mDeadline > kLongestDeadline)
+        throw Error("a deadline is a time from 1 millisecond to 24 hours");
+    if (!mWakeUp)
+        throw Error("this process can open no more files");
     takeIdentity(options);
     connectToDaemon();
     mWatcher = std::thread([this] { watch(); });
@@ -63,8 +71,7 @@ Link::~Link() {
     wakeWatcher();
     if (mWatcher.joinable())
         mWatcher.join();
-    mpServer.reset(); // no event is dispatched from here on
-    lose();
+    mpServer.reset(); // nothing is dispatched from here on
 }
 
 void Link::takeIdentity(const Connection::Options& options) {
@@ -85,12 +92,7 @@ void Link::takeIdentity(const Connection::Options& options) {
 
 bool Link::startServer(int identity) {
     auto receiver = std::make_unique<LTReceiver>(toModuleId(identity));
-    mAdapters.clear();
-    for (long id = 1; id <= kObjectCount; ++id) {
-        auto adapter = std::make_unique<CallbackAdapter>(id);
-        mAdapters.push_back(adapter.get());
-        receiver->addCBAdapter(adapter.release());
-    }
+    mDispatcher.attach(*receiver);
     const auto quiet = [](std::string_view) {};
     auto server = std::make_unique<SocketRemoteReceiver>(kSocketReceiverId, quiet);
     server->addReceiver(receiver.release());
@@ -109,48 +111,52 @@ void Link::connectToDaemon() {
 }
 
 void Link::onLost(std::function<void()> handler) {
-    {
-        const std::lock_guard lock(mMutex);
-        if (!mLost) {
-            mLostHandler = std::move(handler);
-            return;
-        }
-    }
-    handler();
+    const std::lock_guard lock(mMutex);
+    mLostHandler = std::move(handler);
+    if (mLost && mLostHandler)
+        mDispatcher.post(0,
+                         [this, tell = std::exchange(mLostHandler, nullptr)] { callUser(tell); });
 }
 
-long Link::claimObject(EventHandler handler) {
-    for (CallbackAdapter* adapter : mAdapters)
-        if (adapter->claim(handler))
-            return adapter->getId();
-    return 0;
+void Link::onError(std::function<void(std::exception_ptr)> handler) {
+    const std::lock_guard lock(mMutex);
+    mErrorHandler = std::move(handler);
+}
+
+long Link::claimObject(Dispatcher::EventHandler handler) {
+    return mDispatcher.claimObject(std::move(handler));
 }
 
 void Link::releaseObject(long id) {
-    for (CallbackAdapter* adapter : mAdapters)
-        if (adapter->getId() == id)
-            adapter->release();
+    {
+        const std::lock_guard failing(mFailing);
+        failAll(mPending.takeObject(id), released);
+    }
+    mDispatcher.releaseObject(id);
 }
 
 void Link::request(const Request& request, PackedArguments& arguments, Completion completion) {
-    if (await(request, std::move(completion)))
+    if (arguments.size() > static_cast<uint64_t>(PTC::kMaxPayloadSize))
+        return fail(request.replyObject, std::move(completion),
+                    failure<Error>(request.what + ": the text is too long for a request"));
+    if (await(request, std::move(completion)) != 0)
         post(request.service, request.method, arguments);
 }
 
-bool Link::await(const Request& request, Completion completion) {
-    const Clock::time_point deadline = Clock::now() + request.deadline;
-    {
-        const std::lock_guard lock(mMutex);
-        if (!mLost)
-            mPending.push_back({request.replyObject, request.replyMethod, request.answers, deadline,
-                                request.what, std::exchange(completion, nullptr)});
-    }
-    if (completion) {
-        completion(lostFailure(request.what), nullptr);
-        return false;
-    }
-    wakeWatcher();
-    return true;
+long Link::await(const Request& request, Completion completion) {
+    PendingRequest pending;
+    pending.object = request.replyObject;
+    pending.method = request.replyMethod;
+    pending.answers = request.answers;
+    pending.deadline = Clock::now() + mDeadline + request.extraTime;
+    pending.what = request.what;
+    pending.completion = std::move(completion);
+    const long ticket = mPending.add(std::move(pending));
+    if (ticket != 0)
+        wakeWatcher();
+    else
+        fail(request.replyObject, std::move(pending.completion), lost(request.what));
+    return ticket;
 }
 
 void Link::post(long service, long method, PackedArguments& arguments) {
@@ -158,42 +164,38 @@ void Link::post(long service, long method, PackedArguments& arguments) {
                                   static_cast<long>(arguments.size()), true, false));
 }
 
-void Link::answer(long object, long method, ArgumentReader& arguments) {
-    PendingList answered;
-    {
-        const std::lock_guard lock(mMutex);
-        for (auto pending = mPending.begin(); pending != mPending.end();) {
-            const auto next = std::next(pending);
-            if (pending->object == object && pending->method == method) {
-                answered.splice(answered.end(), mPending, pending);
-                if (answered.front().answers == Answers::inOrder)
-                    break;
-            }
-            pending = next;
-        }
-    }
-    for (Pending& pending : answered) {
+void Link::answer(long object, long method, const ArgumentReader& arguments) {
+    for (const PendingRequest& request : mPending.takeAnswered(object, method)) {
         ArgumentReader copy = arguments;
-        if (pending.completion)
-            pending.completion(nullptr, &copy);
+        request.completion.tell(nullptr, &copy);
     }
 }
 
-void Link::abandon(long object) {
-    const std::lock_guard completing(mCompleting);
-    PendingList abandoned;
-    {
-        const std::lock_guard lock(mMutex);
-        for (auto pending = mPending.begin(); pending != mPending.end();) {
-            const auto next = std::next(pending);
-            if (pending->object == object)
-                abandoned.splice(abandoned.end(), mPending, pending);
-            pending = next;
-        }
+void Link::answerTicket(long ticket, const ArgumentReader& arguments) {
+    for (const PendingRequest& request : mPending.takeTicket(ticket)) {
+        ArgumentReader copy = arguments;
+        request.completion.tell(nullptr, &copy);
     }
-    for (Pending& pending : abandoned)
-        if (pending.completion)
-            pending.completion(lostFailure(pending.what), nullptr);
+}
+
+void Link::failTicket(long ticket, std::exception_ptr error) {
+    const std::lock_guard failing(mFailing);
+    for (PendingRequest& request : mPending.takeTicket(ticket))
+        fail(request.object, std::move(request.completion), error);
+}
+
+void Link::fail(long object, Completion completion, std::exception_ptr error) {
+    if (!completion.callsUser) {
+        completion.tell(error, nullptr);
+        return;
+    }
+    mDispatcher.post(object, [tell = std::move(completion.tell), error] { tell(error, nullptr); });
+}
+
+void Link::failAll(PendingRequests::List requests,
+                   std::exception_ptr (*error)(const std::string&)) {
+    for (PendingRequest& request : requests)
+        fail(request.object, std::move(request.completion), error(request.what));
 }
 
 void Link::wakeWatcher() {
@@ -202,68 +204,61 @@ void Link::wakeWatcher() {
 
 void Link::watch() {
     while (!mStopping) {
-        pollfd watched[] = {{mWakeUp.get(), POLLIN, 0}, {mpSender->socket(), POLLRDHUP, 0}};
-        if (mLost)
-            watched[1].fd = -1;
+        pollfd watched[] = {{mWakeUp.get(), POLLIN, 0},
+                            {mLost ? -1 : mpSender->socket(), POLLRDHUP, 0}};
         ::poll(watched, 2, millisecondsToNextDeadline());
         eventfd_t wakeUps = 0;
         ::eventfd_read(mWakeUp.get(), &wakeUps);
-        if ((watched[1].revents & (POLLRDHUP | POLLHUP | POLLERR)) != 0)
-            lose();
-        expireRequests();
+        PTC::barrier([&] {
+            if (watched[1].revents != 0)
+                lose();
+            expireRequests();
+        });
     }
 }
 
 int Link::millisecondsToNextDeadline() {
-    const std::lock_guard lock(mMutex);
-    Clock::time_point next = Clock::time_point::max();
-    for (const Pending& pending : mPending)
-        if (pending.completion)
-            next = std::min(next, pending.deadline);
-    if (next == Clock::time_point::max())
+    const std::optional<Clock::time_point> next = mPending.nextDeadline();
+    if (!next)
         return -1;
-    const auto left = std::chrono::ceil<std::chrono::milliseconds>(next - Clock::now());
+    const auto left = std::chrono::ceil<milliseconds>(*next - Clock::now());
     return static_cast<int>(std::clamp<long>(left.count(), 0, 60'000));
 }
 
 void Link::expireRequests() {
-    const std::lock_guard completing(mCompleting);
-    PendingList expired;
-    {
-        const std::lock_guard lock(mMutex);
-        for (auto pending = mPending.begin(); pending != mPending.end();) {
-            const auto next = std::next(pending);
-            if (pending->completion && pending->deadline <= Clock::now()) {
-                if (pending->answers == Answers::shared) {
-                    expired.splice(expired.end(), mPending, pending);
-                } else {
-                    expired.push_back(*pending);
-                    pending->completion = nullptr;
-                }
-            }
-            pending = next;
-        }
-    }
-    for (Pending& pending : expired)
-        pending.completion(failure<TimedOut>(pending.what + ": the daemon gave no answer"),
-                           nullptr);
+    const std::lock_guard failing(mFailing);
+    failAll(mPending.takeOverdue(Clock::now()), overdue);
 }
 
 void Link::lose() {
-    const std::lock_guard completing(mCompleting);
-    PendingList lost;
-    std::function<void()> handler;
     {
         const std::lock_guard lock(mMutex);
         mLost = true;
-        lost.swap(mPending);
-        handler = std::exchange(mLostHandler, nullptr);
     }
-    for (Pending& pending : lost)
-        if (pending.completion)
-            pending.completion(lostFailure(pending.what), nullptr);
-    if (handler && !mStopping)
-        handler();
+    const std::lock_guard failing(mFailing);
+    failAll(mPending.close(), lost);
+    const std::lock_guard lock(mMutex);
+    if (mLostHandler)
+        mDispatcher.post(0,
+                         [this, tell = std::exchange(mLostHandler, nullptr)] { callUser(tell); });
+}
+
+void Link::reportError(std::exception_ptr error) noexcept {
+    PTC::barrier([&] {
+        std::function<void(std::exception_ptr)> handler;
+        {
+            const std::lock_guard lock(mMutex);
+            handler = mErrorHandler;
+        }
+        if (handler)
+            handler(error);
+    });
+}
+
+ObjectClaim::ObjectClaim(std::shared_ptr<Link> link, Dispatcher::EventHandler handler)
+    : mpLink(std::move(link)), mId(mpLink->claimObject(std::move(handler))) {
+    if (mId == 0)
+        throw Error("too many players on one connection");
 }
 
 } // namespace qnsmedia

@@ -8,7 +8,10 @@
 
 namespace qnsmedia {
 
-/** Base of everything that the library throws or stores in a future. what() is for people. */
+/**
+ * Base of everything that the library throws or stores in a future. what() is for people. An
+ * object of this very class tells of wrong arguments, or of an answer that cannot be read.
+ */
 class QNSMEDIA_API Error : public std::runtime_error {
 public:
     using std::runtime_error::runtime_error;
@@ -38,7 +41,7 @@ public:
     using Error::Error;
 };
 
-/** The daemon has ended, or has closed the connection. */
+/** The daemon has gone, or the player that asked has been destroyed, before an answer came. */
 class QNSMEDIA_API ConnectionLost : public Error {
 public:
     using Error::Error;
@@ -49,7 +52,10 @@ class QNSMEDIA_API MediaError : public Error {
 public:
     MediaError(int result, const std::string& message) : Error(message), mResult(result) {}
 
-    /** The engine's code: 1 not found, 2 access denied, 3 not media, 4 damaged ... */
+    /**
+     * The engine's code: 1 not found, 2 access denied, 3 not media or no decoder, 4 damaged,
+     * 5 not available, 6 cancelled, 7 timed out, 8 no space, 9 internal.
+     */
     [[nodiscard]] int result() const noexcept { return mResult; }
 
 private:

@@ -8,7 +8,15 @@ namespace qnsmedia {
 
 using Nanoseconds = std::chrono::nanoseconds;
 
-enum class PlayerState { closed = 0, paused = 1, notReady = 2, playing = 3, ended = 4, failed = 5 };
+enum class PlayerState {
+    unknown = -1, ///< the daemon has no player
+    closed = 0,
+    paused = 1,
+    notReady = 2, ///< nothing has been opened, or it is being opened
+    playing = 3,
+    ended = 4,
+    failed = 5
+};
 
 struct PlayerStatus {
     PlayerState state = PlayerState::closed;
@@ -36,11 +44,11 @@ struct MediaInfo {
 };
 
 enum class NotificationKind {
-    opened = 1,      ///< an open has finished, well or not: see result
+    opened = 1,      ///< an open has finished, well or not: see result; text = path, or message
     state = 2,       ///< param1 = new PlayerState, param2 = old one; value = position
-    end = 3,         ///< the end was reached
+    end = 3,         ///< the end was reached; value = position
     failure = 4,     ///< playback has failed; text = message
-    loop = 5,        ///< the A-B loop went back to its start
+    loop = 5,        ///< the A-B loop went back to its start; value = position of the start
     buffering = 6,   ///< param1 = percentage
     seekFinished = 7 ///< value = position
 };
@@ -48,8 +56,8 @@ enum class NotificationKind {
 /** An event of the daemon's player, whichever client caused it. */
 struct PlayerNotification {
     NotificationKind kind{};
-    int result = 0; ///< 0 when all is well
-    std::string text;
+    int result = 0;   ///< 0 when all is well, else as MediaError::result()
+    std::string text; ///< bytes in the daemon's locale: UTF-8, unless it was started otherwise
     int param1 = 0;
     int param2 = 0;
     int param3 = 0;
@@ -58,7 +66,7 @@ struct PlayerNotification {
     long value = 0; ///< nanoseconds where it is a position or a duration
 };
 
-/** Media described by a NotificationKind::opened with result 0. */
+/** What a NotificationKind::opened with result 0 tells. */
 inline MediaInfo mediaInfoOf(const PlayerNotification& opened) {
     return {opened.param1,
             opened.param2,
