@@ -46,7 +46,8 @@ std::string findPrefix() {
 } // namespace
 
 int qnsys_getenv_hv_prefix(char* buffer, int capacity) {
-    static const std::string kPrefix = findPrefix();
+    // Never destroyed: threads may ask until the process has ended.
+    static const std::string& kPrefix = *new std::string(findPrefix());
     return copyPath(environmentOr("QNS_HV_PREFIX", kPrefix), buffer, capacity);
 }
 
