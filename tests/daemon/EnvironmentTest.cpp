@@ -153,6 +153,33 @@ TEST_F(Environment, HelpAndVersionArePrintedWithoutAService) {
     }
 }
 
+TEST_F(Environment, AnUnknownOptionIsRefused) {
+    DaemonOptions options = withEngineDouble();
+    options.arguments = {"--no-such-option"};
+    start(options);
+    EXPECT_EQ(mpDaemon->waitForExit(), 2);
+    EXPECT_THAT(mpDaemon->output().joined(), HasSubstr("--no-such-option"));
+}
+
+TEST_F(Environment, WithoutSystemServicesItLogsThatAndEnds) {
+    DaemonOptions options;
+    options.preferLibraries(QNS_QNSYS_DOUBLE_DIR ":" QNS_ENGINE_DOUBLE_DIR);
+    options.environment["QNSYS_DOUBLE_INIT"] = "-1";
+    start(options);
+    EXPECT_EQ(mpDaemon->waitForExit(), 255);
+    EXPECT_THAT(mpDaemon->output().with("initialize is failed"),
+                ElementsAre("<3>MediaPlayerService 101: MediaServiceMain initialize is failed."));
+    EXPECT_THAT(mpDaemon->output().with("quit a.exec"), IsEmpty());
+}
+
+TEST_F(Environment, APositiveResultOfTheSystemServicesIsSuccess) {
+    DaemonOptions options;
+    options.preferLibraries(QNS_QNSYS_DOUBLE_DIR ":" QNS_ENGINE_DOUBLE_DIR);
+    options.environment["QNSYS_DOUBLE_INIT"] = "1";
+    startServing(options);
+    expectService();
+}
+
 class WithoutLogDaemon : public testing::Test {};
 
 TEST_F(WithoutLogDaemon, TheServiceIsTheSame) {

@@ -205,9 +205,11 @@ class Crash : public DaemonTest, public testing::WithParamInterface<int> {};
 TEST_P(Crash, PrintsABackTraceAndAborts) {
     PlayerClient client(1000);
     client.registerCallBack();
+    client.callAccepted(request::kPlay, callback::kPlay);
+    EXPECT_TRUE(mpDaemon->waitForLine("MediaPlayerController::play"));
     mpDaemon->signal(GetParam());
     EXPECT_EQ(mpDaemon->waitForExit(), kAborted);
-    // Somewhere in the event loop.
+    // The main thread is in the event loop.
     EXPECT_THAT(mpDaemon->output().joined(), testing::HasSubstr("QCoreApplication"));
     EXPECT_THAT(mSyslog.lines("onSystemSingleCaught"), IsEmpty());
     EXPECT_THAT(mSyslog.lines("quit a.exec"), IsEmpty());

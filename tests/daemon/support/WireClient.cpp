@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include "tests/daemon/support/WireClient.h"
 
+#include <algorithm>
 #include <array>
 #include <cerrno>
 #include <cstdint>
@@ -172,7 +173,9 @@ bool WireClient::waitForInput(Clock::time_point deadline) {
     std::vector<pollfd> polls{{mListener.get(), POLLIN, 0}};
     for (const auto& incoming : mIncoming)
         polls.push_back({incoming.ended ? -1 : incoming.socket.get(), POLLIN, 0});
-    if (::poll(polls.data(), polls.size(), patience::pollTimeout(deadline)) <= 0)
+    // The daemon does not connect again: when it has hung up, nothing more comes.
+    const int timeout = isHungUp() ? 0 : patience::pollTimeout(deadline);
+    if (::poll(polls.data(), polls.size(), timeout) <= 0)
         return false;
     std::size_t index = 1;
     for (auto& incoming : mIncoming)
@@ -181,6 +184,12 @@ bool WireClient::waitForInput(Clock::time_point deadline) {
     if (polls[0].revents != 0)
         acceptConnection();
     return true;
+}
+
+bool WireClient::isHungUp() const {
+    return !mIncoming.empty() &&
+           std::all_of(mIncoming.begin(), mIncoming.end(),
+                       [](const Incoming& incoming) { return incoming.ended; });
 }
 
 std::optional<wire::Bytes> WireClient::takePacket() {

@@ -74,6 +74,7 @@ private:
 
     [[nodiscard]] patience::Clock::time_point deadline() const;
     bool readAcknowledgements(patience::Clock::time_point deadline);
+    [[nodiscard]] bool isHungUp() const;
     bool waitForInput(patience::Clock::time_point deadline);
     std::optional<wire::Bytes> takePacket();
     void acceptConnection();
