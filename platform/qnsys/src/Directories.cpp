@@ -46,8 +46,7 @@ std::string findPrefix() {
 } // namespace
 
 int qnsys_getenv_hv_prefix(char* buffer, int capacity) {
-    // Never destroyed: threads may ask until the process has ended.
-    static const std::string& kPrefix = *new std::string(findPrefix());
+    static const std::string kPrefix = findPrefix();
     return copyPath(environmentOr("QNS_HV_PREFIX", kPrefix), buffer, capacity);
 }
 
