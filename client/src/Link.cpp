@@ -151,7 +151,7 @@ long Link::await(const Request& request, Completion completion) {
     pending.deadline = Clock::now() + mDeadline + request.extraTime;
     pending.what = request.what;
     pending.completion = std::move(completion);
-    const long ticket = mPending.add(std::move(pending));
+    const long ticket = mPending.add(pending);
     if (ticket != 0)
         wakeWatcher();
     else

@@ -18,7 +18,7 @@ PendingRequests::List PendingRequests::takeWhere(Matches matches) {
     return taken;
 }
 
-long PendingRequests::add(PendingRequest&& request) {
+long PendingRequests::add(PendingRequest& request) {
     const std::lock_guard lock(mMutex);
     if (mClosed)
         return 0;

@@ -45,8 +45,8 @@ class PendingRequests {
 public:
     using List = std::list<PendingRequest>;
 
-    /** The request's ticket; 0 when closed, and then `request` is as it was. */
-    long add(PendingRequest&& request);
+    /** Takes the request and gives its ticket; 0 when closed, and then `request` is as it was. */
+    long add(PendingRequest& request);
 
     /**
      * Takes what an answer completes. An answer that comes too late still uses up its own
