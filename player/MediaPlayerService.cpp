@@ -160,8 +160,7 @@ void MediaPlayerService::powerOffMediaPlayer(int iClientID) {
         return;
     }
     // Queued: called from here, quit() of a GUI application would wait for the main thread.
-    QMetaObject::invokeMethod(QCoreApplication::instance(), &QCoreApplication::quit,
-                              Qt::QueuedConnection);
+    QMetaObject::invokeMethod(QCoreApplication::instance(), "quit", Qt::QueuedConnection);
     LOG_EVENT(kInformation, kModule, 901,
               "MediaPlayerService::powerOffMediaPlayer() : QApplication::quit() finished.");
     if (auto* const callback = callbackOf(iClientID)) {

@@ -70,8 +70,10 @@ std::vector<std::string> SyslogServer::messages(std::string_view text) {
 
 void SyslogServer::readLoop() {
     pollfd poll{mSocket.get(), POLLIN, 0};
-    while (::poll(&poll, 1, -1) == 1 && !mStopped)
-        readAvailable();
+    // Reading may have taken the datagram that was to wake us: look before every wait.
+    while (!mStopped && ::poll(&poll, 1, -1) == 1)
+        if (!mStopped)
+            readAvailable();
 }
 
 void SyslogServer::readAvailable() {
