@@ -4,25 +4,29 @@
 #include <memory>
 
 #include "handle/Barrier.h"
+#include "handle/CallbackData.h"
 
 namespace gst {
 
 namespace {
 
-GstPadProbeReturn callFunction(GstPad*, GstPadProbeInfo* info, gpointer function) {
-    return handle::guarded(GST_PAD_PROBE_OK,
-                           [&] { return (*static_cast<PadProbe::Function*>(function))(*info); });
+using Data = handle::CallbackData<PadProbe::Function>;
+
+GstPadProbeReturn callFunction(GstPad*, GstPadProbeInfo* info, gpointer data) {
+    return handle::guarded(GST_PAD_PROBE_OK, [&] {
+        return static_cast<Data*>(data)->use([&](auto& function) { return function(*info); });
+    });
 }
 
-void deleteFunction(gpointer function) {
-    delete static_cast<PadProbe::Function*>(function);
+void deleteData(gpointer data) {
+    delete static_cast<Data*>(data);
 }
 
 } // namespace
 
 PadProbe::PadProbe(Pad pad, GstPadProbeType what, Function function) : mPad(std::move(pad)) {
-    auto owned = std::make_unique<Function>(std::move(function));
-    mId = gst_pad_add_probe(mPad.get(), what, callFunction, owned.release(), deleteFunction);
+    auto data = std::make_unique<Data>(std::move(function));
+    mId = gst_pad_add_probe(mPad.get(), what, callFunction, data.release(), deleteData);
 }
 
 PadProbe::PadProbe(PadProbe&& other) noexcept

@@ -4,6 +4,7 @@
 #include <memory>
 
 #include "handle/Barrier.h"
+#include "handle/CallbackData.h"
 
 namespace gst {
 
@@ -12,24 +13,30 @@ namespace {
 using PadFunction = std::function<void(const Pad&)>;
 using PlainFunction = std::function<void()>;
 
-void callPadFunction(GstElement*, GstPad* pad, gpointer function) {
-    handle::guarded([&] { (*static_cast<PadFunction*>(function))(Pad(kRef, pad)); });
+void callPadFunction(GstElement*, GstPad* pad, gpointer data) {
+    handle::guarded([&] {
+        static_cast<handle::CallbackData<PadFunction>*>(data)->use(
+            [&](auto& function) { function(Pad(kRef, pad)); });
+    });
 }
 
-void callPlainFunction(GstElement*, gpointer function) {
-    handle::guarded([&] { (*static_cast<PlainFunction*>(function))(); });
+void callPlainFunction(GstElement*, gpointer data) {
+    handle::guarded([&] {
+        static_cast<handle::CallbackData<PlainFunction>*>(data)->use(
+            [&](auto& function) { function(); });
+    });
 }
 
 template<typename Function>
-void deleteFunction(gpointer function, GClosure*) {
-    delete static_cast<Function*>(function);
+void deleteData(gpointer data, GClosure*) {
+    delete static_cast<handle::CallbackData<Function>*>(data);
 }
 
 template<typename Function>
 gulong connect(const Element& element, const char* signal, GCallback callback, Function function) {
-    auto owned = std::make_unique<Function>(std::move(function));
-    return g_signal_connect_data(element.get(), signal, callback, owned.release(),
-                                 deleteFunction<Function>, GConnectFlags{});
+    auto data = std::make_unique<handle::CallbackData<Function>>(std::move(function));
+    return g_signal_connect_data(element.get(), signal, callback, data.release(),
+                                 deleteData<Function>, GConnectFlags{});
 }
 
 } // namespace

@@ -4,6 +4,7 @@
 #include <utility>
 
 #include "handle/Barrier.h"
+#include "handle/CallbackData.h"
 
 namespace engine {
 
@@ -27,18 +28,21 @@ bool isWanted(GstMessage* message, const Target& target) {
     return (GST_MESSAGE_TYPE(message) & kWanted) != 0;
 }
 
+using Data = handle::CallbackData<Target>;
+
 GstBusSyncReply takeMessage(GstBus*, GstMessage* message, gpointer data) {
-    const auto& target = *static_cast<Target*>(data);
     handle::guarded([&] {
-        if (isWanted(message, target))
-            target.mailbox->post(BusEvent{target.number, gst::Message(gst::kRef, message)});
+        static_cast<Data*>(data)->use([&](const Target& target) {
+            if (isWanted(message, target))
+                target.mailbox->post(BusEvent{target.number, gst::Message(gst::kRef, message)});
+        });
     });
     gst_message_unref(message);
     return GST_BUS_DROP;
 }
 
-void deleteTarget(gpointer data) {
-    delete static_cast<Target*>(data);
+void deleteData(gpointer data) {
+    delete static_cast<Data*>(data);
 }
 
 } // namespace
@@ -46,8 +50,8 @@ void deleteTarget(gpointer data) {
 BusTap::BusTap(const gst::Element& pipeline, std::uint64_t number,
                std::shared_ptr<EngineMailbox> mailbox)
     : mBus(gst::kAdopt, gst_element_get_bus(pipeline.get())) {
-    auto target = std::make_unique<Target>(Target{pipeline.get(), number, std::move(mailbox)});
-    gst_bus_set_sync_handler(mBus.get(), takeMessage, target.release(), deleteTarget);
+    auto data = std::make_unique<Data>(Target{pipeline.get(), number, std::move(mailbox)});
+    gst_bus_set_sync_handler(mBus.get(), takeMessage, data.release(), deleteData);
 }
 
 BusTap::~BusTap() {

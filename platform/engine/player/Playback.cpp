@@ -117,6 +117,7 @@ void Playback::onSinkEvent(const SinkEvent& event) {
         mJoints.push_back(event.base);
     }
     refreshClock();
+    finishSettledSeek();
 }
 
 void Playback::onEnd() {
@@ -134,8 +135,7 @@ void Playback::onEnd() {
 }
 
 void Playback::onPrerolled() {
-    if (mFlight && mFlight->flushed)
-        finishSeek(kOk);
+    settleSeek();
 }
 
 void Playback::onPlaying() {
@@ -179,9 +179,8 @@ void Playback::onDurationChanged() {
 void Playback::onDecoderComplaint() {
     if (!mReady)
         return;
-    const bool settled = applyPlaying() == GST_STATE_CHANGE_SUCCESS;
-    if (settled && mFlight && mFlight->flushed)
-        finishSeek(kOk);
+    if (applyPlaying() == GST_STATE_CHANGE_SUCCESS)
+        settleSeek();
 }
 
 TimePoint Playback::deadline() const {
@@ -267,6 +266,17 @@ void Playback::seekInStill(const Flight& flight) {
     timeline.clear();
     timeline.add({mpPipeline->anchor().runningTime, flight.target});
     finishSeek(kOk);
+}
+
+void Playback::settleSeek() {
+    if (mFlight && mFlight->flushed)
+        mFlight->settled = true;
+    finishSettledSeek();
+}
+
+void Playback::finishSettledSeek() {
+    if (mFlight && mFlight->settled && !timeline().isEmpty())
+        finishSeek(kOk);
 }
 
 void Playback::finishSeek(int result) {

@@ -77,12 +77,16 @@ public:
     [[nodiscard]] Nanoseconds position() const;
 
 private:
-    /** A seek on its way: it is over when, after a flush, the sinks have data again. */
+    /**
+     * A seek on its way: it is over when, after a flush, the sinks have data again. Those of two
+     * streams do not get it at once, and a pipeline may claim it early: no place, no data.
+     */
     struct Flight {
         Nanoseconds target{};
         bool announced = false;
         bool wraps = false; ///< goes back to the start of the loop
         bool flushed = false;
+        bool settled = false; ///< the pipeline says that the sinks have data
         TimePoint deadline{};
     };
 
@@ -91,6 +95,8 @@ private:
     void seekQuietly(Nanoseconds target);
     bool seekPipeline(int flags, Nanoseconds start, std::optional<Nanoseconds> stop);
     void seekInStill(const Flight& flight);
+    void settleSeek();
+    void finishSettledSeek();
     void finishSeek(int result);
 
     void applyLoop();
