@@ -57,7 +57,9 @@ TEST_P(EveryFile, OpensPausedAtItsBeginAndTellsWhatItHas) {
     const auto status = mPlayer.status();
     EXPECT_EQ(status.state, kPaused);
     EXPECT_EQ(status.position, 0.0_s);
-    EXPECT_NEAR_SECONDS(status.duration, valueOf(opened), 0.001_s);
+    // An estimate may have improved meanwhile.
+    EXPECT_NEAR_SECONDS(status.duration, valueOf(opened),
+                        std::max(0.001_s, Seconds(sample().tolerance)));
 }
 
 TEST_P(EveryFile, PlaysInRealTimeToItsEnd) {
@@ -67,7 +69,7 @@ TEST_P(EveryFile, PlaysInRealTimeToItsEnd) {
     const auto begin = std::chrono::steady_clock::now();
     const Seconds left = mPlayer.status().duration - mPlayer.status().position;
     const auto end = mPlayer.await(kNotifyEnd);
-    EXPECT_NEAR_SECONDS(std::chrono::steady_clock::now() - begin, left, 0.3_s);
+    EXPECT_NEAR_SECONDS(std::chrono::steady_clock::now() - begin, left, kSlowness * 0.3_s);
     EXPECT_NEAR_SECONDS(valueOf(end), 4.0_s, 0.1_s);
     const auto changed = mPlayer.awaitState(kEnded);
     EXPECT_EQ(changed.param2, kPlaying);
@@ -87,11 +89,11 @@ TEST_P(EveryFile, MovesForwardOnlyWhileItPlaysAndStandsWhilePaused) {
     }
     mPlayer.pause();
     const Seconds paused = mPlayer.status().position;
-    EXPECT_NEAR_SECONDS(paused, last, 0.2_s);
+    EXPECT_NEAR_SECONDS(paused, last, kSlowness * 0.2_s);
     mWatch.clear();
     EXPECT_EQ(mPlayer.status().position, paused);
     mPlayer.play();
-    EXPECT_NEAR_SECONDS(mPlayer.status().position, paused, 0.2_s);
+    EXPECT_NEAR_SECONDS(mPlayer.status().position, paused, kSlowness * 0.2_s);
     EXPECT_GE(mPlayer.status().position, paused);
 }
 
@@ -240,7 +242,7 @@ TEST(Player, CallsReturnAtOnce) {
             player.seek(target);
         player.pause();
     }
-    EXPECT_LT(player.medianCallTime(), 5.0);
+    EXPECT_LT(player.medianCallTime(), kSlowness * 5.0);
 }
 
 TEST(Player, RemembersWhatIsOrderedWhileItOpens) {

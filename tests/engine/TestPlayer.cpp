@@ -30,12 +30,20 @@ void TestPlayer::timed(Call&& call) {
     mCallTimes.push_back(time.count());
 }
 
+/** What has come of another medium. */
+void TestPlayer::forget() {
+    const std::lock_guard lock(mMutex);
+    mNotifications.clear();
+}
+
 TestPlayer::Notification TestPlayer::open(const std::filesystem::path& path, int format) {
+    forget();
     timed([&] { return mpPlayer->open(path.wstring(), format); });
     return await(kNotifyOpened);
 }
 
 TestPlayer::Notification TestPlayer::openText(const std::wstring& text) {
+    forget();
     timed([&] { return mpPlayer->open(text, kDisplay60Hz); });
     return await(kNotifyOpened);
 }
@@ -98,7 +106,8 @@ void TestPlayer::awaitPosition(Seconds position) const {
     const auto deadline = std::chrono::steady_clock::now() + kPatience;
     while (status().position < position) {
         ASSERT_LT(std::chrono::steady_clock::now(), deadline);
-        std::this_thread::yield();
+        // There is no event for a position; look now and then, and leave the processor alone.
+        std::this_thread::sleep_for(std::chrono::milliseconds(2));
     }
 }
 
