@@ -19,7 +19,6 @@ namespace fs = std::filesystem;
 namespace {
 
 using testing::EndsWith;
-using testing::IsEmpty;
 using testing::StartsWith;
 
 const std::string kUserFile = "/var/log/qn_ope.log";

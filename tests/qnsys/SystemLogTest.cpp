@@ -106,7 +106,7 @@ TEST_F(SystemLog, ALongLineComesWhole) {
 }
 
 TEST_F(SystemLog, ALineThatIsTooLongIsDroppedAndTheNextOneComes) {
-    qnsys_syslog(LOG_INFO, "%s", std::string(10'000'000, 'x').c_str());
+    qnsys_syslog(LOG_INFO, "%s", std::string(8'000'000, 'x').c_str());
     qnsys_syslog(LOG_INFO, "next");
     EXPECT_EQ(mDaemon->nextMessage(), "1 log lines were dropped");
     EXPECT_EQ(mDaemon->nextMessage(), "next");
