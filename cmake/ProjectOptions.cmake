@@ -56,3 +56,21 @@ function(qns_add_folder name)
         set_target_properties(qns_${name} PROPERTIES AUTOMOC ON)
     endif()
 endfunction()
+
+# Adds the folders in this order: qns_add_folders(FOLDERS... [ELSEWHERE FOLDERS...])
+# A folder with a CMakeLists.txt must be named, so that none is left out without a word; ELSEWHERE
+# names those that something else adds.
+function(qns_add_folders)
+    cmake_parse_arguments(PARSE_ARGV 0 arg "" "" "ELSEWHERE")
+    foreach(folder IN LISTS arg_UNPARSED_ARGUMENTS)
+        add_subdirectory(${folder})
+    endforeach()
+    file(GLOB lists RELATIVE "${CMAKE_CURRENT_SOURCE_DIR}" CONFIGURE_DEPENDS
+        "${CMAKE_CURRENT_SOURCE_DIR}/*/CMakeLists.txt")
+    foreach(list IN LISTS lists)
+        get_filename_component(folder "${list}" DIRECTORY)
+        if(NOT folder IN_LIST arg_UNPARSED_ARGUMENTS AND NOT folder IN_LIST arg_ELSEWHERE)
+            message(FATAL_ERROR "${CMAKE_CURRENT_LIST_FILE} does not name the folder ${folder}")
+        endif()
+    endforeach()
+endfunction()
