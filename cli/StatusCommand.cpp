@@ -1,10 +1,10 @@
 // SPDX-License-Identifier: MIT
-#include <cstdio>
 #include <nlohmann/json.hpp>
 
 #include "cli/Commands.h"
 #include "cli/ExitCode.h"
 #include "cli/HumanTime.h"
+#include "cli/Output.h"
 #include "cli/StateName.h"
 #include "qnsmedia/Player.h"
 
@@ -16,10 +16,10 @@ int statusCommand(const qnsmedia::Connection::Options& options, bool json) {
         const nlohmann::json object = {{"state", stateName(status.state)},
                                        {"position_ns", status.position.count()},
                                        {"duration_ns", status.duration.count()}};
-        std::puts(object.dump().c_str());
+        show(object.dump() + '\n');
         return kDone;
     }
-    std::printf("%s  %s / %s\n", stateName(status.state), humanTime(status.position).c_str(),
-                humanTime(status.duration).c_str());
+    show(std::string(stateName(status.state)) + "  " + humanTime(status.position) + " / " +
+         humanTime(status.duration) + '\n');
     return kDone;
 }

@@ -3,7 +3,6 @@
 
 #include <array>
 #include <string_view>
-#include <sys/ioctl.h>
 #include <unistd.h>
 
 namespace {
@@ -20,9 +19,16 @@ constexpr KeyName kKeys[] = {
     {"b", Key::loopEnd},         {"q", Key::quit},
 };
 
+/** A job in the background that changes the terminal is stopped. */
+bool isInForeground() {
+    const pid_t group = ::tcgetpgrp(STDIN_FILENO);
+    return group == -1 || group == ::getpgrp();
+}
+
 } // namespace
 
-Terminal::Terminal() : mInteractive(::isatty(STDIN_FILENO) && ::isatty(STDOUT_FILENO)) {
+Terminal::Terminal()
+    : mInteractive(::isatty(STDIN_FILENO) && ::isatty(STDOUT_FILENO) && isInForeground()) {
     if (!mInteractive || ::tcgetattr(STDIN_FILENO, &mBefore) != 0) {
         mInteractive = false;
         return;
@@ -39,12 +45,14 @@ Terminal::~Terminal() {
         ::tcsetattr(STDIN_FILENO, TCSANOW, &mBefore);
 }
 
+int Terminal::input() const {
+    return mInteractive ? STDIN_FILENO : -1;
+}
+
 Key Terminal::readKey() {
-    if (!mInteractive)
-        return Key::none;
     std::array<char, 3> bytes{};
     if (::read(STDIN_FILENO, bytes.data(), 1) != 1)
-        return Key::none;
+        return Key::quit;
     std::size_t length = 1;
     if (bytes[0] == '\x1b') {
         const ssize_t more = ::read(STDIN_FILENO, bytes.data() + 1, 2);

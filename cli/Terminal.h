@@ -8,7 +8,7 @@ enum class Key { none, pause, back, forward, backFar, forwardFar, loopStart, loo
 
 /**
  * Standard input and output as a terminal: keys arrive at once and are not shown, until this
- * object ends. Does nothing where either is not a terminal.
+ * object ends. Does nothing where either is not a terminal, or for a job in the background.
  */
 class Terminal {
 public:
@@ -19,7 +19,10 @@ public:
 
     [[nodiscard]] bool interactive() const { return mInteractive; }
 
-    /** The next key that has been pressed, if any; does not wait. */
+    /** The descriptor that keys come from; -1 when not interactive. */
+    [[nodiscard]] int input() const;
+
+    /** The next key, when the input has something to read; quit when the terminal has gone. */
     [[nodiscard]] Key readKey();
 
 private:

@@ -1,16 +1,19 @@
 // SPDX-License-Identifier: MIT
 #include <CLI/CLI.hpp>
+#include <csignal>
 #include <cstdio>
 
 #include "cli/Commands.h"
 #include "cli/ExitCode.h"
+#include "cli/Output.h"
 #include "qnsmedia/Error.h"
 
 namespace {
 
 constexpr const char* kFooter =
-    "Exit status: 0 done; 1 refused, or the medium cannot be played; 2 wrong usage;\n"
-    "3 the daemon is not running; 4 no answer, or the connection was lost; 130 interrupted.";
+    "Exit status: 0 done; 1 refused, the medium cannot be played or was taken away by another\n"
+    "client, or the output cannot be written; 2 wrong usage; 3 the daemon is not running; 4 no\n"
+    "answer, or the connection was lost; 128 + N ended by signal N, such as 130 by Ctrl-C.";
 
 /** Runs a subcommand and turns its errors into messages and exit codes. */
 template<typename Command>
@@ -27,8 +30,10 @@ int guarded(Command&& command) {
         return tell(error, kNoAnswer);
     } catch (const qnsmedia::ConnectionLost& error) {
         return tell(error, kNoAnswer);
+    } catch (const OutputFailed& error) {
+        return error.code() == std::errc::broken_pipe ? kReaderGone : tell(error, kFailed);
     } catch (const std::exception& error) {
-        return tell(error, kRefused);
+        return tell(error, kFailed);
     }
 }
 
@@ -45,15 +50,15 @@ int main(int argc, char** argv) {
     app.add_option("--identity", options.identity, "Identity to use, instead of the first free")
         ->check(CLI::Range(1000, 1007));
     app.add_option("--timeout", timeout, "Seconds to wait for an answer")
-        ->check(CLI::PositiveNumber)
+        ->check(CLI::Range(0.001, 86400.0))
         ->capture_default_str();
 
     std::string file;
     CLI::App* play = app.add_subcommand("play", "Play a file or a URI to its end");
     play->add_option("FILE", file, "Path or URI")->required();
     play->footer("Keys in a terminal: space pauses and resumes, left and right seek 5 seconds,\n"
-                 "down and up 30, a marks the start of a loop and b its end, a again ends the\n"
-                 "loop, q quits.\n\nExample: qnsmedia play film.mp4");
+                 "down and up 30, a marks the start of a loop and b its end, and either of them\n"
+                 "ends it again, q quits.\n\nExample: qnsmedia play film.mp4");
 
     bool json = false;
     CLI::App* status = app.add_subcommand("status", "Tell the player's state and position");
@@ -65,6 +70,8 @@ int main(int argc, char** argv) {
     } catch (const CLI::ParseError& error) {
         return app.exit(error) == 0 ? kDone : kUsage;
     }
+    // When nobody reads the output any more, what was begun is ended properly.
+    std::signal(SIGPIPE, SIG_IGN);
     options.deadline = std::chrono::milliseconds(static_cast<long>(timeout * 1000));
     return guarded(
         [&] { return play->parsed() ? playCommand(options, file) : statusCommand(options, json); });

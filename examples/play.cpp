@@ -1,17 +1,18 @@
 // SPDX-License-Identifier: MIT
 // Plays a file to its end.
+#include <filesystem>
 #include <future>
 #include <qnsmedia/Player.h>
 
 int main(int, char** argv) {
+    std::promise<void> ended;
     qnsmedia::Connection connection;
     qnsmedia::Player player(connection);
-    std::promise<void> ended;
     player.onNotification([&](const qnsmedia::PlayerNotification& notification) {
         if (notification.kind == qnsmedia::NotificationKind::end)
             ended.set_value();
     });
-    player.openMedia(argv[1]).get();
+    player.openMedia(std::filesystem::absolute(argv[1])).get();
     player.play().get();
     ended.get_future().wait();
 }

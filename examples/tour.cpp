@@ -5,12 +5,13 @@
 #include <condition_variable>
 #include <cstdio>
 #include <deque>
-#include <filesystem>
+#include <functional>
 #include <mutex>
 #include <string>
 #include <unistd.h>
 
 #include "cli/HumanTime.h"
+#include "cli/MediaPath.h"
 #include "qnsmedia/Error.h"
 #include "qnsmedia/Player.h"
 
@@ -18,50 +19,81 @@ using namespace std::chrono_literals;
 using qnsmedia::Nanoseconds;
 using qnsmedia::NotificationKind;
 using qnsmedia::PlayerNotification;
+using qnsmedia::PlayerState;
 
 namespace {
+
+/** How long a step may take that is done as soon as the engine can. */
+constexpr auto kPatience = 10s;
+
+/** Below that there is no time for the steps in the middle. */
+constexpr auto kShort = 2s;
+
+/** Nobody wants to hear a long file to its end when it cannot be sought. */
+constexpr auto kLong = 60s;
 
 /** Notifications, for one thread that waits for them. */
 class Events {
 public:
+    using Filter = std::function<bool(const PlayerNotification&)>;
+
     void add(const PlayerNotification& notification) {
         const std::lock_guard lock(mMutex);
         mWaiting.push_back(notification);
         mArrived.notify_one();
     }
 
-    /** Whether one of this kind comes in time; those before it are dropped. */
-    bool waitFor(NotificationKind kind, std::chrono::milliseconds time) {
+    /** Whether one that matches comes in time; those before it are dropped. */
+    bool waitFor(const Filter& matches, std::chrono::milliseconds time) {
         std::unique_lock lock(mMutex);
         const auto deadline = std::chrono::steady_clock::now() + time;
-        for (;;) {
-            while (!mWaiting.empty()) {
-                const PlayerNotification next = mWaiting.front();
-                mWaiting.pop_front();
-                if (next.kind == NotificationKind::failure)
-                    throw qnsmedia::MediaError(next.result, next.text);
-                if (next.kind == kind)
-                    return true;
-            }
-            if (mArrived.wait_until(lock, deadline) == std::cv_status::timeout)
-                return false;
-        }
+        const auto hasCome = [&] { return takeUntil(matches); };
+        return mArrived.wait_until(lock, deadline, hasCome);
     }
 
+    /** Forgets all that has come. */
     void clear() {
         const std::lock_guard lock(mMutex);
         mWaiting.clear();
     }
 
 private:
-    std::mutex mMutex;
+    bool takeUntil(const Filter& matches) {
+        while (!mWaiting.empty()) {
+            const PlayerNotification next = mWaiting.front();
+            mWaiting.pop_front();
+            if (next.kind == NotificationKind::failure)
+                throw qnsmedia::MediaError(next.result, next.text);
+            if (matches(next))
+                return true;
+        }
+        return false;
+    }
+
+    std::mutex mMutex; ///< guards mWaiting
     std::condition_variable mArrived;
     std::deque<PlayerNotification> mWaiting;
 };
 
+Events::Filter is(NotificationKind kind) {
+    return [=](const PlayerNotification& notification) { return notification.kind == kind; };
+}
+
+Events::Filter isState(PlayerState state) {
+    return [=](const PlayerNotification& notification) {
+        return notification.kind == NotificationKind::state &&
+               notification.param1 == static_cast<int>(state);
+    };
+}
+
+void require(bool happened, const char* what) {
+    if (!happened)
+        throw qnsmedia::TimedOut(std::string("did not happen in time: ") + what);
+}
+
 class Tour {
 public:
-    explicit Tour(const std::string& file) : mFile(file), mPlayer(mConnection) {
+    explicit Tour(const std::string& file) : mPath(mediaPath(file)), mPlayer(mConnection) {
         mPlayer.onNotification([this](const auto& notification) { mEvents.add(notification); });
     }
 
@@ -69,67 +101,67 @@ public:
 
 private:
     void open();
+    void play();
     void showPositions(int count);
     void pauseAndResume();
     void seekTo(Nanoseconds position);
     void loop();
-    void playToTheEnd();
-    void powerOff();
-    void require(bool happened, const char* what);
+    void showEnd();
+    void waitForEnd();
+    void closeAndPowerOff();
+    [[nodiscard]] Nanoseconds position() { return mPlayer.status().get().position; }
 
-    std::string mFile;
+    const std::string mPath;
     Events mEvents;
-    bool mEnded = false; ///< before all steps were shown
     qnsmedia::MediaInfo mMedia;
     qnsmedia::Connection mConnection;
-    qnsmedia::Player mPlayer;
+    qnsmedia::Player mPlayer; ///< last: its notifications use mEvents
 };
 
-void Tour::require(bool happened, const char* what) {
-    if (!happened)
-        throw qnsmedia::TimedOut(std::string("did not happen in time: ") + what);
-}
-
 void Tour::run() {
-    std::printf("Client: registered with identity %d, got client id %d\n", mConnection.identity(),
+    std::printf("Registered as identity %d, client id %d\n", mConnection.identity(),
                 mPlayer.clientId());
     open();
-    mPlayer.play().get();
-    std::puts("Playing");
-    showPositions(5);
-    if (!mEnded)
+    play();
+    if (mMedia.duration == 0s) {
+        showPositions(5);
         pauseAndResume();
-    if (mMedia.seekable && mMedia.duration >= 2s) {
-        seekTo(mMedia.duration / 2);
-        loop();
-        seekTo(mMedia.duration - std::min<Nanoseconds>(mMedia.duration / 4, 1500ms));
-        playToTheEnd();
-    } else if (mMedia.duration > 0s) {
-        std::puts("Too short or not seekable: no seek, no loop");
-        playToTheEnd();
+        std::puts("Without a duration there is nothing to seek, to loop or to end: skipped");
+    } else if (mMedia.duration < kShort) {
+        std::puts("Too short to pause, seek and loop: skipped");
+        waitForEnd();
     } else {
-        std::puts("No duration (a still picture or a live source): no seek, no loop, no end");
+        showPositions(5);
+        pauseAndResume();
+        showEnd();
     }
-    powerOff();
+    closeAndPowerOff();
 }
 
 void Tour::open() {
-    const std::string path = std::filesystem::absolute(mFile).lexically_normal().string();
-    mMedia = mPlayer.openMedia(path).get();
-    std::printf("Opened %s: %d video, %d audio, %d text stream(s), duration %s%s\n", path.c_str(),
-                mMedia.videoStreams, mMedia.audioStreams, mMedia.textStreams,
-                humanTime(mMedia.duration).c_str(), mMedia.seekable ? ", seekable" : "");
+    mMedia = mPlayer.openMedia(mPath).get();
+    std::printf("Opened %s\n", mPath.c_str());
+    std::printf("  streams: %d video, %d audio, %d text; duration: %s%s%s\n", mMedia.videoStreams,
+                mMedia.audioStreams, mMedia.textStreams,
+                mMedia.duration > 0s ? humanTime(mMedia.duration).c_str() : "none",
+                mMedia.seekable ? "; seekable" : "", mMedia.live ? "; live" : "");
+}
+
+void Tour::play() {
+    mPlayer.play().get();
+    require(mEvents.waitFor(isState(PlayerState::playing), kPatience), "playing");
+    std::puts("Playing");
 }
 
 /** One line that moves on a terminal, one line each elsewhere. */
 void Tour::showPositions(int count) {
     const bool terminal = ::isatty(STDOUT_FILENO) != 0;
-    for (int i = 0; i < count && !mEnded; ++i) {
-        const qnsmedia::PlayerStatus status = mPlayer.status().get();
-        std::printf("%s  at %s of %s%s", terminal ? "\r" : "", humanTime(status.position).c_str(),
-                    humanTime(mMedia.duration).c_str(), terminal ? "\033[K" : "\n");
+    for (int i = 0; i < count; ++i) {
+        std::printf("%s  at %s%s", terminal ? "\r" : "", humanTime(position()).c_str(),
+                    terminal ? "\033[K" : "\n");
         std::fflush(stdout);
-        mEnded = mEnded || mEvents.waitFor(NotificationKind::end, 200ms);
+        if (mEvents.waitFor(is(NotificationKind::end), 200ms))
+            throw qnsmedia::Error("the end came too early");
     }
     if (terminal)
         std::puts("");
@@ -137,43 +169,61 @@ void Tour::showPositions(int count) {
 
 void Tour::pauseAndResume() {
     mPlayer.pause().get();
-    require(mMedia.duration == 0s || mEvents.waitFor(NotificationKind::state, 5s), "pause");
-    std::printf("Paused at %s\n", humanTime(mPlayer.status().get().position).c_str());
+    require(mEvents.waitFor(isState(PlayerState::paused), kPatience), "pausing");
+    std::printf("Paused at %s\n", humanTime(position()).c_str());
     mPlayer.play().get();
+    require(mEvents.waitFor(isState(PlayerState::playing), kPatience), "playing again");
     std::puts("Playing again");
 }
 
-void Tour::seekTo(Nanoseconds position) {
-    mEvents.clear();
-    mPlayer.seek(position).get();
-    require(mEvents.waitFor(NotificationKind::seekFinished, 10s), "seek");
-    std::printf("Sought to %s\n", humanTime(mPlayer.status().get().position).c_str());
+/** Seeks and loops where that can be done, and waits for the end where that does not take long. */
+void Tour::showEnd() {
+    if (mMedia.seekable) {
+        seekTo(mMedia.duration / 2);
+        loop();
+        seekTo(mMedia.duration - std::min<Nanoseconds>(mMedia.duration / 4, 1500ms));
+        waitForEnd();
+    } else if (mMedia.duration <= kLong) {
+        std::puts("Not seekable: no seek and no loop");
+        waitForEnd();
+    } else {
+        std::puts("Long and not seekable: no seek, no loop, and no wait for its end");
+    }
 }
 
+void Tour::seekTo(Nanoseconds target) {
+    mEvents.clear();
+    mPlayer.seek(target).get();
+    require(mEvents.waitFor(is(NotificationKind::seekFinished), kPatience), "the seek");
+    std::printf("Sought to %s\n", humanTime(position()).c_str());
+}
+
+/** A-B: from the middle on, for at most a second. */
 void Tour::loop() {
-    const Nanoseconds start = mMedia.duration / 4;
+    const Nanoseconds start = mMedia.duration / 2;
     const Nanoseconds end = start + std::min<Nanoseconds>(mMedia.duration / 4, 1s);
     mEvents.clear();
     mPlayer.repeat(start, end).get();
     std::printf("Looping from %s to %s\n", humanTime(start).c_str(), humanTime(end).c_str());
     for (int wrap = 1; wrap <= 2; ++wrap) {
-        const auto patience = std::chrono::ceil<std::chrono::milliseconds>(mMedia.duration) + 5s;
-        require(mEvents.waitFor(NotificationKind::loop, patience), "the loop's wrap");
-        std::printf("  went back to A (%d)\n", wrap);
+        require(mEvents.waitFor(is(NotificationKind::loop), kPatience), "the loop's return");
+        std::printf("  returned to the start (%d)\n", wrap);
     }
     mPlayer.noRepeat().get();
     std::puts("Loop ended");
 }
 
-void Tour::playToTheEnd() {
-    std::puts("Playing to the end");
-    require(mEnded || mEvents.waitFor(NotificationKind::end, 30s), "the end");
-    std::puts("End of file");
-    mPlayer.close().get();
-    std::puts("Closed");
+void Tour::waitForEnd() {
+    std::puts("Waiting for the end of the file");
+    const auto patience = std::chrono::ceil<std::chrono::milliseconds>(
+        std::min<Nanoseconds>(mMedia.duration, kLong) + kPatience);
+    require(mEvents.waitFor(is(NotificationKind::end), patience), "the end of the file");
+    std::puts("End of the file");
 }
 
-void Tour::powerOff() {
+void Tour::closeAndPowerOff() {
+    mPlayer.close().get();
+    std::puts("Closed");
     mPlayer.powerOff().get();
     std::puts("Power-off accepted");
 }
