@@ -2,8 +2,13 @@
 #include "main/MediaServiceFactory.h"
 
 #include <cstdlib>
+#include <type_traits>
 
 #include "define/ObjectIds.h"
+#include "importer/MediaImporterService.h"
+#include "importer/MediaImporterServiceAdapter.h"
+#include "importer/MediaImporterServiceCallBackRemoteProxy.h"
+#include "importer/MediaImporterServiceNotifyRemoteProxy.h"
 #include "pack/CSimpleBuffer.h"
 #include "player/MediaPlayerService.h"
 #include "player/MediaPlayerServiceAdapter.h"
@@ -32,6 +37,8 @@ struct ProxyMaker {
 };
 
 constexpr ProxyMaker kProxyMakers[] = {
+    {kImporterCallBackId, makeProxy<MediaImporterServiceCallBackRemoteProxy>},
+    {kImporterNotifyId, makeProxy<MediaImporterServiceNotifyRemoteProxy>},
     {kPlayerCallBackId, makeProxy<MediaPlayerServiceCallBackRemoteProxy>},
     {kPlayerNotifyId, makeProxy<MediaPlayerServiceNotifyRemoteProxy>},
 };
@@ -72,6 +79,8 @@ bool MediaServiceFactory::initialize() {
 void MediaServiceFactory::buildServices() {
     mpIdleReceiver = std::make_unique<LTReceiver>(kThreadedReceiverId);
     mpThreadedReceiver = mpIdleReceiver.get();
+    addService<MediaImporterServiceAdapter, MediaImporterService>(kImporterAdapterId,
+                                                                  mpImporterService);
     addService<MediaPlayerServiceAdapter, MediaPlayerService>(kPlayerAdapterId, mpPlayerService);
 }
 
@@ -101,8 +110,14 @@ bool MediaServiceFactory::startServer() {
 void MediaServiceFactory::createInstance(long, void**) {}
 
 void MediaServiceFactory::RegisterObject(long id, void* service) {
-    if (id == kPlayerAdapterId && mpPlayerService == nullptr)
-        mpPlayerService = static_cast<IMediaPlayerService*>(service);
+    const auto keep = [service](auto*& kept) {
+        if (kept == nullptr)
+            kept = static_cast<std::remove_reference_t<decltype(kept)>>(service);
+    };
+    if (id == kImporterAdapterId)
+        keep(mpImporterService);
+    else if (id == kPlayerAdapterId)
+        keep(mpPlayerService);
 }
 
 void* MediaServiceFactory::createAdapter(long, PTC::IReceiver*, void*) {

@@ -5,6 +5,7 @@
 
 #include "ptc/InstanceFactory.h"
 
+class IMediaImporterService;
 class IMediaPlayerService;
 class LTReceiver;
 
@@ -31,8 +32,9 @@ public:
     void createInstance(long id, void** instance) override;
 
     /**
-     * Puts `service`, an IMediaPlayerService for id 62, in the place of the one that initialize()
-     * would make. The first one stays; other ids are ignored. initialize() takes ownership.
+     * Puts `service`, an IMediaImporterService for id 56 or an IMediaPlayerService for id 62, in
+     * the place of the one that initialize() would make. The first one stays; other ids are
+     * ignored. initialize() takes ownership.
      */
     virtual void RegisterObject(long id, void* service);
 
@@ -53,7 +55,9 @@ private:
     bool startServer();
     PTC::ISender* senderFor(long clientIdentity);
 
-    IMediaPlayerService* mpPlayerService = nullptr; ///< owned by its adapter
-    LTReceiver* mpThreadedReceiver = nullptr;       ///< owned by one of the next two
-    std::unique_ptr<LTReceiver> mpIdleReceiver;     ///< while no server runs
+    // Services are owned by their adapters.
+    IMediaImporterService* mpImporterService = nullptr;
+    IMediaPlayerService* mpPlayerService = nullptr;
+    LTReceiver* mpThreadedReceiver = nullptr;   ///< owned by one of the next two
+    std::unique_ptr<LTReceiver> mpIdleReceiver; ///< while no server runs
 };

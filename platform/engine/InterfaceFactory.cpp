@@ -13,4 +13,13 @@ IMediaPlayer* InterfaceFactory::createPlayer(void* window, unsigned int flags) {
         nullptr, [&] { return std::make_unique<engine::Player>(window, flags).release(); });
 }
 
+// This engine plays only, and says so: null.
+IMediaDiscoverer* InterfaceFactory::createDiscoverer() {
+    return nullptr;
+}
+
+IMediaImporter* InterfaceFactory::createImporter() {
+    return nullptr;
+}
+
 } // namespace LibMediaPlayer

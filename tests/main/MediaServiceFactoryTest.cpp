@@ -14,6 +14,8 @@
 #include "base/UniqueFd.h"
 #include "define/ObjectIds.h"
 #include "define/PlayerMethods.h"
+#include "importer/MediaImporterServiceCallBackRemoteProxy.h"
+#include "importer/MediaImporterServiceNotifyRemoteProxy.h"
 #include "player/IMediaPlayerService.h"
 #include "player/IMediaPlayerServiceNotify.h"
 #include "player/MediaPlayerServiceCallBackRemoteProxy.h"
@@ -99,6 +101,7 @@ TEST_F(Factory, UsesTheSenderOfModuleEightForEveryUnknownIdentity) {
 
 TEST_F(Factory, StoresNoSenderForAClientThatCannotBeReached) {
     EXPECT_EQ(mFactory.createProxy(kPlayerCallBackId, 1, 1003), nullptr);
+    EXPECT_EQ(mFactory.createProxy(kImporterCallBackId, 1, 1003), nullptr);
     EXPECT_EQ(mFactory.findSender(4), nullptr);
     ClientPort client(1003);
     EXPECT_NE(mFactory.createProxy(kPlayerCallBackId, 1, 1003), nullptr);
@@ -107,6 +110,10 @@ TEST_F(Factory, StoresNoSenderForAClientThatCannotBeReached) {
 TEST_F(Factory, MakesTheProxyOfTheInterface) {
     ClientPort client(1000);
     const auto make = [&](long interfaceId) { return mFactory.createProxy(interfaceId, 1, 1000); };
+    EXPECT_NE(dynamic_cast<MediaImporterServiceCallBackRemoteProxy*>(make(kImporterCallBackId)),
+              nullptr);
+    EXPECT_NE(dynamic_cast<MediaImporterServiceNotifyRemoteProxy*>(make(kImporterNotifyId)),
+              nullptr);
     EXPECT_NE(dynamic_cast<MediaPlayerServiceCallBackRemoteProxy*>(make(kPlayerCallBackId)),
               nullptr);
     EXPECT_NE(dynamic_cast<MediaPlayerServiceNotifyRemoteProxy*>(make(kPlayerNotifyId)), nullptr);
@@ -122,8 +129,7 @@ TEST_F(Factory, MakesNothingById) {
 
 TEST_F(Factory, MakesNoProxiesOfServicesThatItDoesNotHave) {
     ClientPort client(1000);
-    for (const long interfaceId :
-         {kDiscovererCallBackId, kImporterCallBackId, kImporterNotifyId, kPlayerAdapterId, 0L})
+    for (const long interfaceId : {kDiscovererCallBackId, kImporterAdapterId, kPlayerAdapterId, 0L})
         EXPECT_EQ(mFactory.createProxy(interfaceId, 1, 1000), nullptr) << interfaceId;
     EXPECT_EQ(client.connections(), 0);
 }

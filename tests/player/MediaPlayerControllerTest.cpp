@@ -6,8 +6,8 @@
 #include <QMetaMethod>
 #include <QSignalSpy>
 
-#include "tests/player/OutputCapture.h"
 #include "tests/player/PlayerFixture.h"
+#include "tests/support/OutputCapture.h"
 
 using platform_double::LogLine;
 using testing::_;

@@ -14,7 +14,7 @@
 #include "player/MediaPlayerServiceCallBackRemoteProxy.h"
 #include "player/MediaPlayerServiceNotifyRemoteProxy.h"
 #include "ptc/IFactory.h"
-#include "tests/player/Bytes.h"
+#include "tests/support/Bytes.h"
 
 using namespace MediaServiceDefine;
 using testing::_;

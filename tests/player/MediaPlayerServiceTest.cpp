@@ -7,8 +7,8 @@
 #include <QMetaMethod>
 #include <QSignalSpy>
 
-#include "tests/player/OutputCapture.h"
 #include "tests/player/PlayerFixture.h"
+#include "tests/support/OutputCapture.h"
 
 using LibMediaPlayer::RepeatParam;
 using platform_double::LogLine;

@@ -16,8 +16,8 @@
 #include "ptc/Event.h"
 #include "ptc/IFactory.h"
 #include "tests/player/EngineMock.h"
-#include "tests/player/PlatformDouble.h"
-#include "tests/player/RecordingSender.h"
+#include "tests/support/PlatformDouble.h"
+#include "tests/support/RecordingSender.h"
 
 /** Numbers of the requests, as they stand in packets. */
 enum RequestId : long {

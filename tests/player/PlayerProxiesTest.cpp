@@ -6,7 +6,7 @@
 
 #include <gmock/gmock.h>
 
-#include "tests/player/RecordingSender.h"
+#include "tests/support/RecordingSender.h"
 
 using testing::ElementsAre;
 

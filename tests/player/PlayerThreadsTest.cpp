@@ -6,8 +6,8 @@
 #include <thread>
 
 #include "player/MediaPlayerController.h"
-#include "tests/player/OutputCapture.h"
 #include "tests/player/PlayerFixture.h"
+#include "tests/support/OutputCapture.h"
 
 using testing::Each;
 using testing::SizeIs;

@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-/** The platform library's place in the player's tests: keeps the system log's lines. */
+/** The platform library's place in the services' tests: keeps the system log's lines. */
 namespace platform_double {
 
 constexpr char kPrefix[] = "/opt/caf\xC3\xA9";

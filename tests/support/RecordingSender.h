@@ -8,7 +8,7 @@
 
 #include "ptc/Event.h"
 #include "ptc/ISender.h"
-#include "tests/player/Bytes.h"
+#include "tests/support/Bytes.h"
 
 /** An event as it would reach a client. */
 struct SentEvent {

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include "tests/player/PlatformDouble.h"
+#include "tests/support/PlatformDouble.h"
 
 #include <cstdarg>
 #include <cstdio>
