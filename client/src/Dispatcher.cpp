@@ -39,8 +39,7 @@ public:
         const Dispatcher::EventHandler handle = handler;
         if (!handle)
             return;
-        ArgumentReader arguments(event->data, event->size);
-        handle(event->methodId, arguments);
+        handle(mId, event->methodId, ArgumentReader(event->data, event->size));
     }
 
     Dispatcher::EventHandler handler;

@@ -22,8 +22,9 @@ class ErrandAdapter;
  */
 class Dispatcher {
 public:
-    /** Takes an event's method and arguments. */
-    using EventHandler = std::function<void(long method, ArgumentReader& arguments)>;
+    /** Takes the id of the object that is called, and the event's method and arguments. */
+    using EventHandler =
+        std::function<void(long object, long method, const ArgumentReader& arguments)>;
     using Errand = std::function<void()>;
 
     Dispatcher();

@@ -258,7 +258,7 @@ void Link::reportError(std::exception_ptr error) noexcept {
 ObjectClaim::ObjectClaim(std::shared_ptr<Link> link, Dispatcher::EventHandler handler)
     : mpLink(std::move(link)), mId(mpLink->claimObject(std::move(handler))) {
     if (mId == 0)
-        throw Error("too many players on one connection");
+        throw Error("too many players and the like on one connection");
 }
 
 } // namespace qnsmedia

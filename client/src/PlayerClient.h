@@ -5,38 +5,19 @@
 #include <mutex>
 #include <string>
 
-#include "client/src/Link.h"
-#include "define/PlayerMethods.h"
+#include "client/src/NotificationHandler.h"
+#include "client/src/ServiceClient.h"
 #include "qnsmedia/Player.h"
 
 namespace qnsmedia {
 
-/** A request of the player and the answer to it. */
-struct PlayerOperation {
-    MediaServiceDefine::PlayerMethod method;
-    MediaServiceDefine::PlayerCallBack answer;
-    const char* name;
-    Answers answers = Answers::inOrder;
-    std::chrono::milliseconds extraTime{};
-};
-
-/** A player's two objects, what is asked through them and who waits. Any thread may use it. */
+/** A client of the player that knows what becomes of an open. Any thread may use it. */
 class PlayerClient {
 public:
     explicit PlayerClient(std::shared_ptr<Link> link);
-    ~PlayerClient();
-    PlayerClient(const PlayerClient&) = delete;
-    PlayerClient& operator=(const PlayerClient&) = delete;
 
-    [[nodiscard]] int clientId() const { return mClientId; }
-    [[nodiscard]] Link& link() const { return *mpLink; }
-    void onNotification(Player::NotificationHandler handler);
-
-    /** Begins with this client's id, as nearly all requests do. */
-    [[nodiscard]] PackedArguments ownId() const;
-
-    void send(const PlayerOperation& operation, PackedArguments& arguments, Completion completion);
-    void post(MediaServiceDefine::PlayerMethod method, PackedArguments& arguments);
+    [[nodiscard]] const ServiceClient& service() const { return mService; }
+    void onNotification(Player::NotificationHandler handler) { mHandler.set(std::move(handler)); }
 
     void open(const std::string& path, Completion completion);
 
@@ -50,20 +31,14 @@ private:
         std::string path;
     };
 
-    void registerClient();
     [[nodiscard]] long awaitOpened(const std::string& path, Completion completion);
     void notified(long method, const ArgumentReader& arguments);
     void opened(const PlayerNotification& notification, const ArgumentReader& arguments);
 
-    std::shared_ptr<Link> mpLink;
-    int mClientId = 0;
-
-    std::mutex mMutex; ///< guards the next two
-    Player::NotificationHandler mHandler;
+    NotificationHandler<PlayerNotification> mHandler;
+    std::mutex mMutex; ///< guards mOpening
     Opening mOpening;
-
-    ObjectClaim mNotifyObject; ///< last: from here on events come
-    ObjectClaim mCallBackObject;
+    ServiceClient mService; ///< last: its notifications use the others
 };
 
 } // namespace qnsmedia

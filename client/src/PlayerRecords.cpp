@@ -11,14 +11,6 @@ constexpr long kAbsent = std::numeric_limits<long>::min();
 
 } // namespace
 
-std::optional<int> readInteger(ArgumentReader& arguments) {
-    long value = kAbsent;
-    arguments.read(value);
-    if (value == kAbsent)
-        return std::nullopt;
-    return static_cast<int>(value);
-}
-
 std::optional<PlayerStatus> readStatus(ArgumentReader& arguments) {
     int state = 0;
     int reserved = 0;

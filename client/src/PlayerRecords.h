@@ -9,7 +9,6 @@
 /** What the daemon's player sends, decoded; nothing when it ends early. */
 namespace qnsmedia {
 
-std::optional<int> readInteger(ArgumentReader& arguments);
 std::optional<PlayerStatus> readStatus(ArgumentReader& arguments);
 std::optional<PlayerNotification> readNotification(ArgumentReader& arguments);
 
