@@ -154,6 +154,12 @@ protected:
         return event.value_or(PlayerEvent{});
     }
 
+    PlayerEvent openFilm() {
+        const auto event = open(sample::film());
+        EXPECT_EQ(event.result, 0) << event.text;
+        return event;
+    }
+
     static bool isReady(const PlayerStatus& status) { return status.code != kNotReady; }
 
     static bool isPlaying(const PlayerStatus& status) { return status.code == kPlaying; }
@@ -162,8 +168,7 @@ protected:
 };
 
 TEST_F(Playback, OpeningAFilmTellsItsStreamsAndItsDuration) {
-    const auto event = open(sample::film());
-    EXPECT_EQ(event.result, 0);
+    const auto event = openFilm();
     EXPECT_EQ(event.text, sample::film());
     EXPECT_EQ(event.video, 1);
     EXPECT_EQ(event.audio, 1);
@@ -177,7 +182,7 @@ TEST_F(Playback, OpeningAFilmTellsItsStreamsAndItsDuration) {
 }
 
 TEST_F(Playback, MovesInRealTimeUntilItIsPaused) {
-    open(sample::film());
+    openFilm();
     mClient.request(request::kPlay);
     const auto first = waitForStatus(isPlaying);
     const auto start = patience::Clock::now();
@@ -193,7 +198,7 @@ TEST_F(Playback, MovesInRealTimeUntilItIsPaused) {
 }
 
 TEST_F(Playback, SeeksAccurately) {
-    open(sample::film());
+    openFilm();
     for (const std::int64_t position : {7 * kSecond + kSecond / 2, 2 * kSecond + kSecond / 5}) {
         mClient.seek(position, 0);
         const auto done = waitForEvent(kSeekDone);
@@ -204,7 +209,7 @@ TEST_F(Playback, SeeksAccurately) {
 }
 
 TEST_F(Playback, SeeksRelativeToWhereItIs) {
-    open(sample::film());
+    openFilm();
     mClient.seek(4 * kSecond, 0);
     ASSERT_TRUE(waitForEvent(kSeekDone));
     mClient.seek(-kSecond, 2);
@@ -213,7 +218,7 @@ TEST_F(Playback, SeeksRelativeToWhereItIs) {
 }
 
 TEST_F(Playback, LoopsBetweenTwoPoints) {
-    open(sample::film());
+    openFilm();
     mClient.setRepeat(true, 3 * kSecond, 4 * kSecond);
     mClient.seek(3 * kSecond, 0);
     ASSERT_TRUE(waitForEvent(kSeekDone));
@@ -238,11 +243,12 @@ TEST_F(Playback, TellsTheEnd) {
 }
 
 TEST_F(Playback, IsOverWithTheClose) {
-    open(sample::film());
+    openFilm();
     mClient.request(request::kPlay);
     waitForStatus(isPlaying);
     mClient.request(request::kClosePlayer);
-    EXPECT_EQ(status().code, kNotReady);
+    // A notification that was on its way makes the daemon ask the engine all the same.
+    EXPECT_THAT(status().code, testing::AnyOf(kNotReady, kClosed));
 }
 
 TEST_F(Playback, OfNamesWithForeignCharactersWorks) {
@@ -260,7 +266,7 @@ TEST_F(Playback, OfWhatCannotBePlayedIsRefusedWithAReasonAndTheNextFilmPlays) {
         const auto refused = open(name);
         EXPECT_NE(refused.result, 0);
         EXPECT_NE(refused.text, "");
-        EXPECT_EQ(open(sample::film()).result, 0);
+        openFilm();
     }
 }
 
@@ -270,11 +276,11 @@ TEST_F(Playback, InitializeShowsThePictureAndLeavesThePlayerClosed) {
     ASSERT_TRUE(opened);
     EXPECT_EQ(opened->result, 0) << opened->text;
     EXPECT_THAT(opened->text, testing::EndsWith("/share/mediaplayer/images/black.jpg"));
-    EXPECT_EQ(open(sample::film()).result, 0);
+    openFilm();
 }
 
 TEST_F(Playback, EndsWithTheDaemonWhilePlaying) {
-    open(sample::film());
+    openFilm();
     mClient.request(request::kPlay);
     waitForStatus(isPlaying);
     mClient.request(request::kPowerOffMediaPlayer);
@@ -282,7 +288,7 @@ TEST_F(Playback, EndsWithTheDaemonWhilePlaying) {
 }
 
 TEST_F(Playback, EndsBySignalWhilePlaying) {
-    open(sample::film());
+    openFilm();
     mClient.request(request::kPlay);
     waitForStatus(isPlaying);
     const auto start = patience::Clock::now();
