@@ -23,22 +23,20 @@ inline bool isPlain(Character character) {
     return static_cast<std::make_unsigned_t<Character>>(character) - 1u < 0x7Fu;
 }
 
-template<class Character>
-inline bool isPlainBlock(const Character* text) {
+/** Copies sixteen characters; false, and then what was copied means nothing, when one is not plain.
+ */
+template<class From, class To>
+inline bool copyPlainBlock(const From* from, To* to) {
     bool plain = true;
-    for (std::size_t i = 0; i < kBlock; ++i)
-        plain = plain && isPlain(text[i]);
+    for (std::size_t i = 0; i < kBlock; ++i) {
+        plain = plain && isPlain(from[i]);
+        to[i] = static_cast<To>(from[i]);
+    }
     return plain;
 }
 
-template<class From, class To>
-inline void copyBlock(const From* from, To* to) {
-    for (std::size_t i = 0; i < kBlock; ++i)
-        to[i] = static_cast<To>(from[i]);
-}
-
 #ifdef __SSE2__
-// Compilers make poor vector code of the loops above. These overloads are for the two text types.
+// Compilers make poor vector code of the loop above. These overloads are for the two text types.
 static_assert(sizeof(wchar_t) == 4);
 
 template<class Character>
@@ -58,19 +56,14 @@ inline bool isPlainBlock(__m128i bytes) {
     return _mm_movemask_epi8(_mm_or_si128(bytes, nul)) == 0;
 }
 
-inline bool isPlainBlock(const wchar_t* text) {
-    return isPlainBlock(narrowed(text));
-}
-inline bool isPlainBlock(const char* text) {
-    return isPlainBlock(load(text));
-}
-
 template<class Byte>
-inline void copyBlock(const wchar_t* from, Byte* to) {
-    _mm_storeu_si128(reinterpret_cast<__m128i*>(to), narrowed(from));
+inline bool copyPlainBlock(const wchar_t* from, Byte* to) {
+    const __m128i bytes = narrowed(from);
+    _mm_storeu_si128(reinterpret_cast<__m128i*>(to), bytes);
+    return isPlainBlock(bytes);
 }
 
-inline void copyBlock(const char* from, wchar_t* to) {
+inline bool copyPlainBlock(const char* from, wchar_t* to) {
     const __m128i zero = _mm_setzero_si128();
     const __m128i bytes = load(from);
     const __m128i low = _mm_unpacklo_epi8(bytes, zero);
@@ -80,36 +73,28 @@ inline void copyBlock(const char* from, wchar_t* to) {
     _mm_storeu_si128(target + 1, _mm_unpackhi_epi16(low, zero));
     _mm_storeu_si128(target + 2, _mm_unpacklo_epi16(high, zero));
     _mm_storeu_si128(target + 3, _mm_unpackhi_epi16(high, zero));
+    return isPlainBlock(bytes);
 }
 #endif
 
 } // namespace ascii
 
-/** How many characters come before the first that is NUL or not ASCII. */
-template<class Character>
-[[nodiscard]] inline std::size_t asciiPrefix(const Character* text, std::size_t count) {
+/**
+ * Copies characters up to the first that is NUL or not ASCII, widening or narrowing each, and
+ * returns how many. `to` has room for `count`; what stands in it behind the copy means nothing.
+ */
+template<class From, class To>
+inline std::size_t copyAsciiPrefix(const From* from, std::size_t count, To* to) {
     std::size_t at = 0;
-    while (count - at >= ascii::kBlock && ascii::isPlainBlock(text + at))
+    while (count - at >= ascii::kBlock && ascii::copyPlainBlock(from + at, to + at))
         at += ascii::kBlock;
     const bool isTail = count - at < ascii::kBlock;
-    if (isTail && count >= ascii::kBlock && ascii::isPlainBlock(text + count - ascii::kBlock))
+    const std::size_t last = count - ascii::kBlock;
+    if (isTail && count >= ascii::kBlock && ascii::copyPlainBlock(from + last, to + last))
         return count;
-    while (at < count && ascii::isPlain(text[at]))
-        ++at;
+    for (; at < count && ascii::isPlain(from[at]); ++at)
+        to[at] = static_cast<To>(from[at]);
     return at;
-}
-
-/** Copies `count` ASCII characters, widening or narrowing each. */
-template<class From, class To>
-inline void copyAscii(const From* from, std::size_t count, To* to) {
-    if (count < ascii::kBlock) {
-        for (std::size_t i = 0; i < count; ++i)
-            to[i] = static_cast<To>(from[i]);
-        return;
-    }
-    for (std::size_t at = 0; count - at >= ascii::kBlock; at += ascii::kBlock)
-        ascii::copyBlock(from + at, to + at);
-    ascii::copyBlock(from + count - ascii::kBlock, to + count - ascii::kBlock);
 }
 
 } // namespace qns

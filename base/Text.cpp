@@ -8,6 +8,7 @@
 #include <clocale>
 #include <cstring>
 #include <cwchar>
+#include <langinfo.h>
 #include <locale.h>
 #include <memory>
 #include <mutex>
@@ -46,6 +47,7 @@ private:
 struct LocaleSnapshot {
     Environment environment;
     locale_t locale;
+    bool isUtf8;
     std::unique_ptr<const LocaleSnapshot> previous;
 };
 
@@ -64,18 +66,19 @@ const LocaleSnapshot* rebuild() {
     const LocaleSnapshot* previous = gCurrent.load(std::memory_order_acquire);
     if (previous != nullptr && previous->environment.is(::environ))
         return previous;
-    auto next = std::make_unique<LocaleSnapshot>(
-        LocaleSnapshot{Environment(::environ), loadLocale(previous),
-                       std::unique_ptr<const LocaleSnapshot>(previous)});
+    const locale_t locale = loadLocale(previous);
+    auto next = std::make_unique<LocaleSnapshot>(LocaleSnapshot{
+        Environment(::environ), locale, std::strcmp(::nl_langinfo_l(CODESET, locale), "UTF-8") == 0,
+        std::unique_ptr<const LocaleSnapshot>(previous)});
     gCurrent.store(next.get(), std::memory_order_release);
     return next.release();
 }
 
-locale_t environmentLocale() {
+const LocaleSnapshot& environmentLocale() {
     const LocaleSnapshot* current = gCurrent.load(std::memory_order_acquire);
     if (current == nullptr || !current->environment.is(::environ))
         current = rebuild();
-    return current->locale;
+    return *current;
 }
 
 /** The process's own locale is the environment's from the first conversion on. */
@@ -134,17 +137,75 @@ void appendConverted(std::basic_string<To>& out, std::basic_string_view<From> fr
     }
 }
 
+char* encodeUtf8(char32_t character, char* to) {
+    const auto put = [&to](char32_t byte) { *to++ = static_cast<char>(byte); };
+    if (character < 0x80) {
+        put(character);
+        return to;
+    }
+    if (character < 0x800) {
+        put(0xC0 | character >> 6);
+    } else {
+        if (character < 0x10000) {
+            put(0xE0 | character >> 12);
+        } else {
+            put(0xF0 | character >> 18);
+            put(0x80 | (character >> 12 & 0x3F));
+        }
+        put(0x80 | (character >> 6 & 0x3F));
+    }
+    put(0x80 | (character & 0x3F));
+    return to;
+}
+
+bool isUnicode(char32_t character) {
+    return character < 0xD800 || (character > 0xDFFF && character <= 0x10FFFF);
+}
+
+/**
+ * Converts what needs no C library: the common case, in a third of its time. Takes it from `text`,
+ * and leaves what begins with a character that is none in Unicode.
+ */
+void appendUtf8(std::string& out, std::wstring_view& text) {
+    constexpr std::size_t kLongest = 4;
+    std::array<char, 1024> chunk;
+    char* to = chunk.data();
+    std::size_t at = 0;
+    for (; at < text.size() && isUnicode(static_cast<char32_t>(text[at])); ++at) {
+        if (to > chunk.data() + chunk.size() - kLongest) {
+            out.append(chunk.data(), to);
+            to = chunk.data();
+        }
+        to = encodeUtf8(static_cast<char32_t>(text[at]), to);
+    }
+    out.append(chunk.data(), to);
+    text.remove_prefix(at);
+}
+
+/** The C library reads UTF-8 well enough. */
+void appendUtf8(std::wstring&, std::string_view&) {}
+
+template<class To, class From>
+void appendOthers(std::basic_string<To>& out, std::basic_string_view<From> text) {
+    const LocaleSnapshot& environment = environmentLocale();
+    if (environment.isUtf8)
+        appendUtf8(out, text);
+    if (text.empty())
+        return;
+    const ThreadLocale use(environment.locale);
+    appendConverted(out, text);
+}
+
 template<class To, class From>
 std::basic_string<To> converted(std::basic_string_view<From> text) {
     adoptEnvironmentLocale();
-    const std::size_t ascii = asciiPrefix(text.data(), text.size());
-    std::basic_string<To> out(ascii, To{});
-    copyAscii(text.data(), ascii, out.data());
-    if (ascii == text.size() || text[ascii] == From{})
-        return out;
+    std::basic_string<To> out(text.size(), To{});
+    const std::size_t ascii = copyAsciiPrefix(text.data(), text.size(), out.data());
+    out.resize(ascii);
     text.remove_prefix(ascii);
-    const ThreadLocale use(environmentLocale());
-    appendConverted(out, text.substr(0, text.find(From{})));
+    text = text.substr(0, text.find(From{}));
+    if (!text.empty())
+        appendOthers(out, text);
     return out;
 }
 

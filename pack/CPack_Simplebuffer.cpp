@@ -9,6 +9,25 @@
 
 namespace {
 
+/**
+ * Most text is ASCII and most buffers have room: such text goes straight there, with neither a
+ * locale nor a temporary string. Anything else changes nothing and returns false.
+ */
+bool packAsciiInPlace(simplebuffer* buffer, const std::wstring& text) {
+    const uint64_t length = text.size() + 1;
+    const uint64_t header = qns::Encoding::sizeOfRawHeader(length);
+    if (header == 0 || buffer->alloc < buffer->size ||
+        buffer->alloc - buffer->size < header + length)
+        return false;
+    uint8_t* const start = buffer->data + buffer->size;
+    if (qns::copyAsciiPrefix(text.data(), text.size(), start + header) != text.size())
+        return false;
+    CPack().pack_raw_header(start, length);
+    start[header + text.size()] = 0;
+    buffer->size += header + length;
+    return true;
+}
+
 /** Apart from the common case, which it would slow down. */
 [[gnu::noinline]] int packConverted(simplebuffer* buffer, const std::wstring& text) {
     try {
@@ -39,13 +58,6 @@ int CPack_Simplebuffer::pack_simplebuffer_string(simplebuffer* buffer, const std
     return pack_simplebuffer_raw(buffer, text.c_str(), text.size() + 1);
 }
 
-// Most text is ASCII and needs neither a locale nor a temporary string.
 int CPack_Simplebuffer::pack_simplebuffer_wstring(simplebuffer* buffer, const std::wstring& text) {
-    const std::size_t ascii = qns::asciiPrefix(text.data(), text.size());
-    if (text.c_str()[ascii] != L'\0')
-        return packConverted(buffer, text);
-    return appendRaw(buffer, ascii + 1, [&](uint8_t* to) {
-        qns::copyAscii(text.data(), ascii, to);
-        to[ascii] = 0;
-    });
+    return packAsciiInPlace(buffer, text) ? 1 : packConverted(buffer, text);
 }

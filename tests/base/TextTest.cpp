@@ -60,6 +60,28 @@ TEST(Text, ConvertsUtf8BothWays) {
     EXPECT_EQ(widen(kNarrow), kWide);
 }
 
+TEST(Text, NarrowsTheFirstAndLastCharacterOfEachUtf8Length) {
+    const Variable locale("LC_ALL", "C.UTF-8");
+    EXPECT_EQ(narrow(L"\x01\x7F\x80"), "\x01\x7F\xC2\x80");
+    EXPECT_EQ(narrow(L"\u07FF\u0800"), "\xDF\xBF\xE0\xA0\x80");
+    EXPECT_EQ(narrow(L"\uD7FF\uE000"), "\xED\x9F\xBF\xEE\x80\x80");
+    EXPECT_EQ(narrow(L"\uFFFF\U00010000"), "\xEF\xBF\xBF\xF0\x90\x80\x80");
+    EXPECT_EQ(narrow(L"\U0010FFFF"), "\xF4\x8F\xBF\xBF");
+}
+
+/** All characters, and what lies between and behind them, just as the C library has it. */
+TEST(Text, NarrowsEachCharacterAsTheCLibraryDoes) {
+    const Variable locale("LC_ALL", "C.UTF-8");
+    ASSERT_NE(std::setlocale(LC_ALL, ""), nullptr);
+    for (unsigned character = 1; character < 0x120000; ++character) {
+        const wchar_t text[] = {static_cast<wchar_t>(character), L'\0'};
+        char expected[16]{};
+        if (std::wcstombs(expected, text, sizeof expected) == static_cast<std::size_t>(-1))
+            expected[0] = '\0';
+        ASSERT_EQ(narrow(text), expected) << character;
+    }
+}
+
 TEST(Text, ConvertsEveryLengthAroundTheBlocksOfTheFastPath) {
     const Variable locale("LC_ALL", "C.UTF-8");
     for (std::size_t length = 0; length < 70; ++length) {
