@@ -1,15 +1,11 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include "define/FileName.h"
+
 #include <string>
 
 namespace MediaServiceDefine {
-
-/** The file that a client wants opened; used by player and discoverer. */
-struct _tagFileName {
-    int iClientID = -1;
-    std::wstring strFileName;
-};
 
 struct _tagSeekParam {
     int iClientID = -1;

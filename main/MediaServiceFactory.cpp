@@ -5,6 +5,9 @@
 #include <type_traits>
 
 #include "define/ObjectIds.h"
+#include "discoverer/MediaDiscovererService.h"
+#include "discoverer/MediaDiscovererServiceAdapter.h"
+#include "discoverer/MediaDiscovererServiceCallBackRemoteProxy.h"
 #include "importer/MediaImporterService.h"
 #include "importer/MediaImporterServiceAdapter.h"
 #include "importer/MediaImporterServiceCallBackRemoteProxy.h"
@@ -37,6 +40,7 @@ struct ProxyMaker {
 };
 
 constexpr ProxyMaker kProxyMakers[] = {
+    {kDiscovererCallBackId, makeProxy<MediaDiscovererServiceCallBackRemoteProxy>},
     {kImporterCallBackId, makeProxy<MediaImporterServiceCallBackRemoteProxy>},
     {kImporterNotifyId, makeProxy<MediaImporterServiceNotifyRemoteProxy>},
     {kPlayerCallBackId, makeProxy<MediaPlayerServiceCallBackRemoteProxy>},
@@ -79,6 +83,8 @@ bool MediaServiceFactory::initialize() {
 void MediaServiceFactory::buildServices() {
     mpIdleReceiver = std::make_unique<LTReceiver>(kThreadedReceiverId);
     mpThreadedReceiver = mpIdleReceiver.get();
+    addService<MediaDiscovererServiceAdapter, MediaDiscovererService>(kDiscovererAdapterId,
+                                                                      mpDiscovererService);
     addService<MediaImporterServiceAdapter, MediaImporterService>(kImporterAdapterId,
                                                                   mpImporterService);
     addService<MediaPlayerServiceAdapter, MediaPlayerService>(kPlayerAdapterId, mpPlayerService);
@@ -114,7 +120,9 @@ void MediaServiceFactory::RegisterObject(long id, void* service) {
         if (kept == nullptr)
             kept = static_cast<std::remove_reference_t<decltype(kept)>>(service);
     };
-    if (id == kImporterAdapterId)
+    if (id == kDiscovererAdapterId)
+        keep(mpDiscovererService);
+    else if (id == kImporterAdapterId)
         keep(mpImporterService);
     else if (id == kPlayerAdapterId)
         keep(mpPlayerService);

@@ -5,6 +5,7 @@
 
 #include "ptc/InstanceFactory.h"
 
+class IMediaDiscovererService;
 class IMediaImporterService;
 class IMediaPlayerService;
 class LTReceiver;
@@ -32,9 +33,9 @@ public:
     void createInstance(long id, void** instance) override;
 
     /**
-     * Puts `service`, an IMediaImporterService for id 56 or an IMediaPlayerService for id 62, in
-     * the place of the one that initialize() would make. The first one stays; other ids are
-     * ignored. initialize() takes ownership.
+     * Puts `service`, an IMediaDiscovererService for id 51, an IMediaImporterService for id 56 or
+     * an IMediaPlayerService for id 62, in the place of the one that initialize() would make. The
+     * first one stays; other ids are ignored. initialize() takes ownership.
      */
     virtual void RegisterObject(long id, void* service);
 
@@ -56,6 +57,7 @@ private:
     PTC::ISender* senderFor(long clientIdentity);
 
     // Services are owned by their adapters.
+    IMediaDiscovererService* mpDiscovererService = nullptr;
     IMediaImporterService* mpImporterService = nullptr;
     IMediaPlayerService* mpPlayerService = nullptr;
     LTReceiver* mpThreadedReceiver = nullptr;   ///< owned by one of the next two

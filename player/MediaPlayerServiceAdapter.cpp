@@ -7,15 +7,11 @@
 #include "player/IMediaPlayerServiceCallBack.h"
 #include "player/IMediaPlayerServiceNotify.h"
 #include "ptc/Event.h"
+#include "ptc/FileNameArgument.h"
 
 using namespace MediaServiceDefine;
 
 namespace {
-
-void deserialize_openPlayer_param(_tagFileName& param, ArgumentReader& reader) {
-    reader.read(param.iClientID);
-    reader.read(param.strFileName);
-}
 
 void deserialize_seek_param(_tagSeekParam& param, ArgumentReader& reader) {
     reader.read(param.iClientID);
@@ -37,7 +33,7 @@ void MediaPlayerServiceAdapter::receive(PTC::Event* event) {
     using Service = IMediaPlayerService;
     static constexpr Method kMethods[] = {
         {PlayerMethod::initializePlayer, call<&Service::initializePlayer>},
-        {PlayerMethod::openPlayer, call<&Service::openPlayer, deserialize_openPlayer_param>},
+        {PlayerMethod::openPlayer, call<&Service::openPlayer, PTC::readFileName>},
         {PlayerMethod::closePlayer, call<&Service::closePlayer>},
         {PlayerMethod::play, call<&Service::play>},
         {PlayerMethod::pause, call<&Service::pause>},

@@ -6,8 +6,8 @@
 
 #include <gmock/gmock.h>
 
-#include "LibMediaPlayer/IMediaDiscoverer.h"
 #include "LibMediaPlayer/IMediaImporter.h"
+#include "tests/support/DiscovererMock.h"
 
 /** The engine's importer, linked into the test. Operations that are not expected return 0. */
 class ImporterMock : public LibMediaPlayer::IMediaImporter {
@@ -25,24 +25,6 @@ public:
     }
 
     std::function<void(LibMediaPlayer::MediaImporterNotify&)> notify;
-};
-
-/** The engine's discoverer. */
-class DiscovererMock : public LibMediaPlayer::IMediaDiscoverer {
-public:
-    MOCK_METHOD(int, open, (const std::wstring& path), (override));
-    MOCK_METHOD(int, close, (), (override));
-    MOCK_METHOD(int, metadata, (LibMediaPlayer::MediaMetaInfo & info), (override));
-    MOCK_METHOD(int, reserved5, (), (override));
-    MOCK_METHOD(int, makeImage,
-                (int64_t position, int32_t width, int32_t height, const std::wstring& path),
-                (override));
-    MOCK_METHOD(int, reserved7, (), (override));
-    MOCK_METHOD(int, supportedExtensions, (LibMediaPlayer::SupportedExtensions & extensions),
-                (override));
-
-    ~DiscovererMock() override { died(); }
-    MOCK_METHOD(void, died, ());
 };
 
 /** What the engine's factory gives next; the caller owns it. */

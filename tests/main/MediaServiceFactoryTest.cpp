@@ -14,6 +14,7 @@
 #include "base/UniqueFd.h"
 #include "define/ObjectIds.h"
 #include "define/PlayerMethods.h"
+#include "discoverer/MediaDiscovererServiceCallBackRemoteProxy.h"
 #include "importer/MediaImporterServiceCallBackRemoteProxy.h"
 #include "importer/MediaImporterServiceNotifyRemoteProxy.h"
 #include "player/IMediaPlayerService.h"
@@ -110,6 +111,8 @@ TEST_F(Factory, StoresNoSenderForAClientThatCannotBeReached) {
 TEST_F(Factory, MakesTheProxyOfTheInterface) {
     ClientPort client(1000);
     const auto make = [&](long interfaceId) { return mFactory.createProxy(interfaceId, 1, 1000); };
+    EXPECT_NE(dynamic_cast<MediaDiscovererServiceCallBackRemoteProxy*>(make(kDiscovererCallBackId)),
+              nullptr);
     EXPECT_NE(dynamic_cast<MediaImporterServiceCallBackRemoteProxy*>(make(kImporterCallBackId)),
               nullptr);
     EXPECT_NE(dynamic_cast<MediaImporterServiceNotifyRemoteProxy*>(make(kImporterNotifyId)),
@@ -129,7 +132,7 @@ TEST_F(Factory, MakesNothingById) {
 
 TEST_F(Factory, MakesNoProxiesOfServicesThatItDoesNotHave) {
     ClientPort client(1000);
-    for (const long interfaceId : {kDiscovererCallBackId, kImporterAdapterId, kPlayerAdapterId, 0L})
+    for (const long interfaceId : {kDiscovererAdapterId, kImporterAdapterId, kPlayerAdapterId, 0L})
         EXPECT_EQ(mFactory.createProxy(interfaceId, 1, 1000), nullptr) << interfaceId;
     EXPECT_EQ(client.connections(), 0);
 }
@@ -203,8 +206,8 @@ TEST(RegisteredService, OfTheFirstRegistrationIsServedAndDeletedWithTheFactory) 
         auto* player = new PlayerDouble(isDeleted);
         auto played = player->played();
         factory.RegisterObject(kPlayerAdapterId, asService(player));
-        factory.RegisterObject(kPlayerAdapterId, &factory);     // comes too late
-        factory.RegisterObject(kDiscovererAdapterId, &factory); // there is no such service
+        factory.RegisterObject(kPlayerAdapterId, &factory);      // comes too late
+        factory.RegisterObject(kDiscovererCallBackId, &factory); // there is no such service
         ASSERT_TRUE(factory.initialize());
 
         SocketRemoteSender client(kThreadedReceiverId);

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <functional>
 #include <mutex>
 #include <ostream>
 #include <utility>
@@ -33,6 +34,8 @@ public:
     long getId() override { return 1; }
 
     void send(PTC::Event* event) override {
+        if (atSend)
+            atSend();
         const std::lock_guard lock(mMutex);
         mAllForClients = mAllForClients && event->isRemote && event->isCallback;
         mEvents.push_back(
@@ -48,6 +51,9 @@ public:
 
     /** True when every event had both flags set. */
     [[nodiscard]] bool allForClients() const { return mAllForClients; }
+
+    /** Called before each event is kept, on the thread that sends it. */
+    std::function<void()> atSend;
 
 private:
     std::mutex mMutex;
