@@ -2,11 +2,14 @@
 #include "cli/Output.h"
 
 #include <cerrno>
-#include <cstdio>
+#include <unistd.h>
 
 void show(std::string_view text) {
-    errno = 0;
-    const bool isWritten = std::fwrite(text.data(), 1, text.size(), stdout) == text.size();
-    if (!isWritten || std::fflush(stdout) != 0)
-        throw OutputFailed(errno, std::generic_category(), "standard output");
+    while (!text.empty()) {
+        const ssize_t count = ::write(STDOUT_FILENO, text.data(), text.size());
+        if (count < 0 && errno != EINTR)
+            throw OutputFailed(errno, std::generic_category(), "standard output");
+        if (count > 0)
+            text.remove_prefix(static_cast<std::size_t>(count));
+    }
 }

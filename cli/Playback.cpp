@@ -20,10 +20,13 @@ namespace {
 constexpr auto kTerminalTick = 100ms;
 constexpr auto kPlainTick = 500ms;
 
-/** Another client may have got an answer of ours, but not one after another. */
-constexpr int kStatusesToLose = 2;
+/** Another client that asks at the same time may have got the answer. */
+constexpr auto kAskAgain = 1s;
 
-/** False once another client has closed the medium or opens another one. */
+/**
+ * False once another client has closed the medium or opens another one; also for a moment after
+ * the daemon has told that it is open.
+ */
 bool hasMedium(PlayerState state) {
     return state != PlayerState::closed && state != PlayerState::notReady &&
            state != PlayerState::unknown;
@@ -83,7 +86,7 @@ void Playback::follow() {
     while (mEnd == End::none) {
         if (mIsOpen)
             askStatus();
-        if (mLoop.wait(interactive ? kTerminalTick : kPlainTick, mTerminal->input()))
+        if (mLoop.wait(tick(), mTerminal->input()))
             handleKey(mTerminal->readKey());
         throwError();
         checkSignal();
@@ -167,19 +170,23 @@ void Playback::end(End reason) {
         mEnd = reason;
 }
 
+std::chrono::milliseconds Playback::tick() const {
+    return mTerminal->interactive() ? kTerminalTick : kPlainTick;
+}
+
 void Playback::askStatus() {
-    if (std::exchange(mAsksStatus, true))
+    const auto now = Clock::now();
+    if (now < mNextStatus)
         return;
+    mNextStatus = now + kAskAgain;
     mPlayer.status([this](std::exception_ptr error, qnsmedia::PlayerStatus status) {
         mLoop.post([this, error, status] { gotStatus(error, status); });
     });
 }
 
+/** One answer serves all requests that wait: none within the deadline means that none comes. */
 void Playback::gotStatus(std::exception_ptr error, const qnsmedia::PlayerStatus& status) {
-    mAsksStatus = false;
-    mStatusesLost = error ? mStatusesLost + 1 : 0;
-    if (isA<qnsmedia::TimedOut>(error) && mStatusesLost < kStatusesToLose)
-        return;
+    mNextStatus = Clock::now() + tick();
     if (error) {
         mError = error;
         return;
@@ -187,10 +194,14 @@ void Playback::gotStatus(std::exception_ptr error, const qnsmedia::PlayerStatus&
     if (mEnd != End::none)
         return;
     mStatus = status;
-    hasMedium(status.state) ? showStatus() : end(End::takenOver);
+    if (hasMedium(status.state))
+        showStatus();
+    else if (mShowsStatus)
+        end(End::takenOver);
 }
 
 void Playback::showStatus() {
+    mShowsStatus = true;
     const std::string line = std::string(stateName(mStatus.state)) + "  " +
                              humanTime(mStatus.position) + " / " + humanTime(mStatus.duration);
     if (mTerminal->interactive())
@@ -270,6 +281,7 @@ void Playback::playAnswered(std::exception_ptr error) {
 
 /** What cannot be done now is left undone: the medium plays on. */
 void Playback::keyAnswered(std::exception_ptr error) {
+    mNextStatus = {};
     if (error && !isA<qnsmedia::Refused>(error))
         mError = error;
 }

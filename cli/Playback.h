@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <chrono>
 #include <exception>
 #include <functional>
 #include <optional>
@@ -22,6 +23,8 @@ public:
     int run();
 
 private:
+    using Clock = std::chrono::steady_clock;
+
     /** What ends a playback. */
     enum class End { none, reached, failed, quit, signal, takenOver };
 
@@ -35,6 +38,7 @@ private:
     void throwError();
     void end(End reason);
 
+    [[nodiscard]] std::chrono::milliseconds tick() const;
     void askStatus();
     void gotStatus(std::exception_ptr error, const qnsmedia::PlayerStatus& status);
     void showStatus();
@@ -65,8 +69,8 @@ private:
     bool mIsClosed = false;
 
     qnsmedia::PlayerStatus mStatus;
-    bool mAsksStatus = false;
-    int mStatusesLost = 0;
+    Clock::time_point mNextStatus; ///< when to ask for it
+    bool mShowsStatus = false; ///< since the first status of the open medium
     long mShownSecond = -1;
 
     std::optional<qnsmedia::Nanoseconds> mLoopStart;

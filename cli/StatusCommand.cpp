@@ -1,4 +1,6 @@
 // SPDX-License-Identifier: MIT
+#include <chrono>
+#include <future>
 #include <nlohmann/json.hpp>
 
 #include "cli/Commands.h"
@@ -8,10 +10,24 @@
 #include "cli/StateName.h"
 #include "qnsmedia/Player.h"
 
+namespace {
+
+constexpr std::chrono::milliseconds kAskAgain{500};
+
+/** Another client that asks at the same time may get the answer: then it is asked for again. */
+qnsmedia::PlayerStatus askStatus(qnsmedia::Player& player) {
+    std::future<qnsmedia::PlayerStatus> answer = player.status();
+    while (answer.wait_for(kAskAgain) != std::future_status::ready)
+        (void)player.status(); // one answer serves all requests that wait
+    return answer.get();
+}
+
+} // namespace
+
 int statusCommand(const qnsmedia::Connection::Options& options, bool json) {
     qnsmedia::Connection connection(options);
     qnsmedia::Player player(connection);
-    const qnsmedia::PlayerStatus status = player.status().get();
+    const qnsmedia::PlayerStatus status = askStatus(player);
     if (json) {
         const nlohmann::json object = {{"state", stateName(status.state)},
                                        {"position_ns", status.position.count()},
