@@ -1,0 +1,56 @@
+// SPDX-License-Identifier: MIT
+#include "tests/cli/support/ToolTest.h"
+
+using testing::EndsWith;
+using testing::HasSubstr;
+
+namespace {
+
+class Examples : public ToolTest {
+protected:
+    /** Takes the tour, which ends the daemon. */
+    std::string tour(const std::string& file) {
+        Tool tool(QNS_TOUR, {file}, Tool::Output::pipe);
+        EXPECT_EQ(tool.waitForExit(), 0) << tool.output() << tool.errors();
+        EXPECT_EQ(mpDaemon->waitForExit(), 0);
+        return tool.output();
+    }
+};
+
+TEST_F(Examples, TheTourTellsEveryStepOfAFilm) {
+    const std::string told = tour(sample::filmWithUnicodeName());
+    std::size_t at = 0;
+    for (const char* step :
+         {"Registered as identity 1000, client id 1", "Opened ", "1 video, 1 audio, 0 text",
+          "duration: 0:10.0; seekable", "Playing\n", "  at 0:00.", "Paused at ", "Playing again",
+          "Sought to 0:05.0", "Looping from 0:05.0 to 0:06.0", "returned to the start (1)",
+          "returned to the start (2)", "Loop ended", "Sought to 0:08.5", "End of the file",
+          "Closed", "Power-off accepted"}) {
+        const std::size_t found = told.find(step, at);
+        ASSERT_NE(found, std::string::npos) << step << " is not in\n" << told.substr(at);
+        at = found;
+    }
+}
+
+TEST_F(Examples, TheTourLeavesOutWhatAShortSoundCannotDo) {
+    EXPECT_THAT(tour(sample::shortSound()), HasSubstr("Too short"));
+}
+
+TEST_F(Examples, TheTourLeavesOutWhatAPictureCannotDo) {
+    EXPECT_THAT(tour(QNS_SOURCE_DIR "/share/mediaplayer/images/black.jpg"),
+                HasSubstr("Without a duration"));
+}
+
+TEST_F(Examples, TheTourSaysWhatCannotBePlayed) {
+    Tool tool(QNS_TOUR, {sample::noise()}, Tool::Output::pipe);
+    EXPECT_EQ(tool.waitForExit(), 1);
+    EXPECT_THAT(tool.errors(), testing::StartsWith("Failed: "));
+}
+
+TEST_F(Examples, TheShortestProgramPlaysAFileToItsEnd) {
+    Tool tool(QNS_EXAMPLE_PLAY, {sample::shortSound()}, Tool::Output::pipe);
+    EXPECT_EQ(tool.waitForExit(), 0) << tool.errors();
+    EXPECT_TRUE(mpDaemon->waitForLine("MediaPlayerController::play"));
+}
+
+} // namespace

@@ -1,0 +1,37 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+#include <utility>
+#include <vector>
+
+#include <gmock/gmock.h>
+
+#include "tests/cli/support/Tool.h"
+#include "tests/daemon/support/DaemonTest.h"
+#include "tests/daemon/support/SampleMedia.h"
+
+/** The tool against the daemon with the engine that plays. */
+class ToolTest : public DaemonTest {
+protected:
+    void SetUp() override {
+        start(DaemonOptions{});
+        ASSERT_TRUE(mpDaemon->waitUntilServing()) << mpDaemon->output().joined();
+    }
+
+    /** Puts an identity before the arguments: the daemon serves each of them once. */
+    std::vector<std::string> withIdentity(std::vector<std::string> arguments) {
+        arguments.insert(arguments.begin(), {"--identity", std::to_string(mNextIdentity++)});
+        return arguments;
+    }
+
+    /** The daemon has closed the medium. */
+    void expectClosed() {
+        Tool status(withIdentity({"status"}));
+        EXPECT_EQ(status.waitForExit(), 0) << status.errors();
+        EXPECT_THAT(status.output(), testing::StartsWith("not ready"));
+    }
+
+private:
+    int mNextIdentity = 1000;
+};
