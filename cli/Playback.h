@@ -70,7 +70,7 @@ private:
 
     qnsmedia::PlayerStatus mStatus;
     Clock::time_point mNextStatus; ///< when to ask for it
-    bool mShowsStatus = false; ///< since the first status of the open medium
+    bool mShowsStatus = false;     ///< since the first status of the open medium
     long mShownSecond = -1;
 
     std::optional<qnsmedia::Nanoseconds> mLoopStart;
