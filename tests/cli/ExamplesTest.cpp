@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include "tests/cli/support/ToolTest.h"
 
-using testing::EndsWith;
 using testing::HasSubstr;
 
 namespace {

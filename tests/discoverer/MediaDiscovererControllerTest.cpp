@@ -16,7 +16,6 @@ using LibMediaPlayer::SupportedExtensions;
 using testing::_;
 using testing::DoAll;
 using testing::ElementsAre;
-using testing::Eq;
 using testing::IsEmpty;
 using testing::Return;
 using testing::SetArgReferee;

@@ -18,7 +18,6 @@ using namespace MediaServiceDefine;
 using testing::_;
 using testing::AllOf;
 using testing::Field;
-using testing::Mock;
 using testing::NiceMock;
 using testing::Return;
 using testing::StrictMock;

@@ -19,7 +19,6 @@ using namespace MediaServiceDefine;
 using testing::_;
 using testing::AllOf;
 using testing::Field;
-using testing::Mock;
 using testing::Return;
 using testing::StrictMock;
 
