@@ -16,6 +16,7 @@ struct Options {
 
 /** The subcommands. Each adds its rows to the report and returns the exit status. */
 int runPack(const Options& options, Report& report);
+int runPlayer(const Options& options, Report& report);
 int runRpc(const Options& options, Report& report);
 int runStart(const Options& options, Report& report);
 

@@ -17,6 +17,7 @@ struct Bench {
 
 constexpr Bench kBenches[] = {
     {"pack", "encode and decode every value form, beside msgpack-c", bench::runPack},
+    {"player", "open, seek, close and loop real files, beside libmpv", bench::runPlayer},
     {"rpc", "one request and its answer, beside bare sockets and D-Bus", bench::runRpc},
     {"start", "start-up, memory and idle load, beside an empty QApplication and MPD",
      bench::runStart},

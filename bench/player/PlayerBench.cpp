@@ -1,0 +1,125 @@
+// SPDX-License-Identifier: MIT
+// What a listener waits for, beside libmpv in the same process: opening, seeking, closing, and
+// by how much the rounds of a loop miss their time.
+#include <algorithm>
+#include <cmath>
+#include <cstdio>
+#include <cstdlib>
+#include <filesystem>
+#include <unistd.h>
+
+#include "bench/Benches.h"
+#include "bench/Report.h"
+#include "bench/player/PlayerPeer.h"
+
+namespace bench {
+namespace {
+
+using namespace std::chrono_literals;
+
+constexpr int kDefaultRounds = 15;
+constexpr int kLoopRounds = 5;
+
+/** Key frames lie two seconds apart: this is far from one, and a little behind one. */
+constexpr Position kTargets[] = {11'700ms, 5'200ms};
+constexpr Position kLoopStart = 6s;
+constexpr Position kLoopEnd = 6500ms;
+
+struct Contender {
+    const char* name;
+    std::unique_ptr<PlayerPeer> pPlayer;
+};
+
+/** What was measured of one contender with one file. */
+struct Samples {
+    std::vector<double> open;
+    std::vector<double> keySeek;
+    std::vector<double> exactSeek;
+    std::vector<double> close;
+    std::vector<double> loopError;
+};
+
+struct Measurement {
+    const char* name;
+    std::vector<double> Samples::*samples;
+};
+
+constexpr Measurement kMeasurements[] = {
+    {"open to ready", &Samples::open},
+    {"seek to key frame", &Samples::keySeek},
+    {"seek exactly", &Samples::exactSeek},
+    {"close", &Samples::close},
+    {"loop: error a round", &Samples::loopError},
+};
+
+void measure(PlayerPeer& player, const std::string& path, Samples& samples) {
+    samples.open.push_back(player.open(path).count());
+    for (const Position target : kTargets) {
+        samples.keySeek.push_back(player.seek(target, false).count());
+        samples.exactSeek.push_back(player.seek(target + 400ms, true).count());
+    }
+    samples.close.push_back(player.close().count());
+}
+
+void measureLoop(PlayerPeer& player, const std::string& path, Samples& samples) {
+    player.open(path);
+    const Milliseconds due = kLoopEnd - kLoopStart;
+    for (const Milliseconds time : player.loop(kLoopStart, kLoopEnd, kLoopRounds))
+        samples.loopError.push_back(std::abs((time - due).count()));
+    player.close();
+}
+
+void addRows(Report& report, const std::string& what, const std::vector<Contender>& contenders,
+             const std::vector<Samples>& samples) {
+    for (const Measurement& measurement : kMeasurements) {
+        Row row{what + ", " + measurement.name, "ms", {}};
+        for (std::size_t i = 0; i < contenders.size(); ++i)
+            row.entries.push_back({contenders[i].name, summarize(samples[i].*measurement.samples)});
+        report.add(std::move(row));
+    }
+}
+
+/** Every contender in turn, so that whatever the machine does meets them all. */
+void measureFile(const std::filesystem::path& file, int rounds,
+                 const std::vector<Contender>& contenders, Report& report) {
+    std::vector<Samples> samples(contenders.size());
+    const auto forEach = [&](auto&& run) {
+        for (std::size_t i = 0; i < contenders.size(); ++i)
+            run(*contenders[i].pPlayer, file.string(), samples[i]);
+    };
+    std::vector<Samples> unused(1);
+    for (const Contender& contender : contenders) // what is read the first time only
+        measure(*contender.pPlayer, file.string(), unused.front());
+    for (int round = 0; round < rounds; ++round)
+        forEach(measure);
+    forEach(measureLoop);
+    addRows(report, file.filename().string(), contenders, samples);
+}
+
+std::vector<std::filesystem::path> filesIn(const std::filesystem::path& folder) {
+    std::vector<std::filesystem::path> files;
+    for (const auto& entry : std::filesystem::directory_iterator(folder))
+        files.push_back(entry.path());
+    std::sort(files.begin(), files.end());
+    return files;
+}
+
+} // namespace
+
+int runPlayer(const Options& options, Report& report) {
+    const std::filesystem::path folder =
+        std::filesystem::temp_directory_path() / ("qnsmedia-bench-" + std::to_string(::getpid()));
+    const std::string make = std::string(QNS_MAKE_MEDIA) + " '" + folder.string() + "'";
+    if (std::system(make.c_str()) != 0)
+        return 1;
+    std::vector<Contender> contenders;
+    contenders.push_back({"engine", makeEnginePeer()});
+    contenders.push_back({"libmpv", makeMpvPeer()});
+    const int rounds = options.rounds > 0 ? options.rounds : kDefaultRounds;
+    for (const std::filesystem::path& file : filesIn(folder))
+        measureFile(file, rounds, contenders, report);
+    std::filesystem::remove_all(folder);
+    return 0;
+}
+
+} // namespace bench
