@@ -12,4 +12,10 @@ namespace engine {
  */
 std::string toBytes(std::wstring_view text);
 
+/** The way back. Any thread. */
+std::wstring toWide(std::string_view bytes);
+
+/** The text in UTF-8, whatever the environment says. */
+std::string toUtf8(std::wstring_view text);
+
 } // namespace engine
