@@ -1,0 +1,102 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <SQLiteCpp/SQLiteCpp.h>
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <sys/types.h>
+#include <vector>
+
+#include "library/MediaRecord.h"
+#include "library/Tags.h"
+
+namespace library {
+
+/** A file of the library that was copied from somewhere else. */
+struct KnownCopy {
+    std::string path;
+    std::int64_t size = 0;
+    std::int64_t modified = 0;
+};
+
+/** A file that was about to get its final name. The inode tells it from one that others put there.
+ */
+struct PendingCopy {
+    std::string path;
+    ino_t inode = 0;
+};
+
+/** A medium that has no thumbnail yet. */
+struct MissingThumbnail {
+    std::int64_t id = 0;
+    std::string path;
+    int tries = 0; ///< how often it may still be tried
+};
+
+/**
+ * The media library's database. A committed transaction survives a power cut.
+ *
+ * For one thread; other programs may read and write the file at the same time. Every operation
+ * throws Error.
+ */
+class Database {
+public:
+    /** Opens the file, or begins a new one, and brings it to the present version. */
+    explicit Database(const std::string& file);
+    Database(const Database&) = delete;
+    Database& operator=(const Database&) = delete;
+
+    /** All writes happen inside one. Rolled back unless committed. */
+    class Transaction {
+    public:
+        explicit Transaction(Database& database);
+        void commit();
+
+    private:
+        const std::string mFile;
+        SQLite::Transaction mTransaction;
+    };
+
+    /** False when the file has been removed, or another one put in its place. */
+    [[nodiscard]] bool isInPlace() const;
+
+    /** Closing leaves the files as they are: for one that is damaged. */
+    void abandon();
+
+    /** Adds a medium, or brings the row of its path up to date. */
+    void put(const MediaRecord& record);
+
+    /** The source of the medium with this path; nothing when there is none. */
+    std::optional<std::string> sourceOf(const std::string& path);
+
+    std::vector<KnownCopy> copiesOf(const std::string& source);
+
+    void beginCopy(const PendingCopy& copy);
+    void endCopy(const std::string& path);
+    std::vector<PendingCopy> pendingCopies();
+
+    /** Those with more tries left come first. */
+    std::vector<MissingThumbnail> missingThumbnails(int limit);
+    void setThumbnailTries(std::int64_t id, int tries);
+    void putThumbnail(std::int64_t id, const std::string& jpeg);
+
+private:
+    class Use;
+
+    void migrate();
+    void prepare();
+    void putStreams(std::int64_t id, const LibMediaPlayer::MediaMetaInfo& info);
+    void putVideo(std::int64_t id, const LibMediaPlayer::VideoMetaInfo& video);
+    void putAudio(std::int64_t id, int number, const LibMediaPlayer::AudioMetaInfo& audio);
+    void putTags(std::int64_t id, const std::vector<Tag>& tags);
+    std::int64_t putMedia(const MediaRecord& record, const std::vector<Tag>& tags);
+
+    const std::string mFile;
+    SQLite::Database mDatabase;
+    std::vector<SQLite::Statement> mStatements; ///< after the database, so that they go first
+    dev_t mDevice = 0;
+    ino_t mInode = 0;
+};
+
+} // namespace library
