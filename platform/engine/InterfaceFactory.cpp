@@ -2,8 +2,12 @@
 #include "LibMediaPlayer/InterfaceFactory.h"
 
 #include <memory>
+#include <utility>
 
 #include "handle/Barrier.h"
+#include "importer/Importer.h"
+#include "importer/LookProbe.h"
+#include "importer/Options.h"
 #include "player/Player.h"
 
 namespace LibMediaPlayer {
@@ -13,13 +17,18 @@ IMediaPlayer* InterfaceFactory::createPlayer(void* window, unsigned int flags) {
         nullptr, [&] { return std::make_unique<engine::Player>(window, flags).release(); });
 }
 
-// This engine plays only, and says so: null.
+// This engine does not discover, and says so: null.
 IMediaDiscoverer* InterfaceFactory::createDiscoverer() {
     return nullptr;
 }
 
 IMediaImporter* InterfaceFactory::createImporter() {
-    return nullptr;
+    return handle::guarded<IMediaImporter*>(nullptr, [] {
+        importer::Options options;
+        options.dataFolder = importer::dataFolder();
+        options.probe = importer::probeByLook;
+        return std::make_unique<importer::Importer>(std::move(options)).release();
+    });
 }
 
 } // namespace LibMediaPlayer

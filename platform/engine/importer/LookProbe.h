@@ -1,0 +1,11 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include "importer/Probe.h"
+
+namespace importer {
+
+/** The details that a short look at a file tells. */
+Probed probeByLook(const std::string& path);
+
+} // namespace importer

@@ -1,0 +1,21 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <chrono>
+#include <string>
+
+#include "importer/Probe.h"
+
+namespace importer {
+
+/** What an importer works with. */
+struct Options {
+    std::string dataFolder; ///< absolute; empty when it is not known
+    Probe probe;
+    std::chrono::milliseconds progressInterval{200}; ///< at least so long between two
+};
+
+/** The device's data directory; empty when it is not known. */
+std::string dataFolder();
+
+} // namespace importer
