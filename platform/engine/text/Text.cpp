@@ -124,13 +124,6 @@ wchar_t takeUtf8(std::string_view& bytes) {
     return isCharacter(code, length) ? static_cast<wchar_t>(code) : kReplacement;
 }
 
-std::wstring fromUtf8(std::string_view bytes) {
-    std::wstring text;
-    while (!bytes.empty())
-        text += takeUtf8(bytes);
-    return text;
-}
-
 } // namespace
 
 std::string toBytes(std::wstring_view text) {
@@ -143,6 +136,13 @@ std::wstring toWide(std::string_view bytes) {
     if (auto text = fromEnvironmentCharset(bytes))
         return *std::move(text);
     return fromUtf8(bytes);
+}
+
+std::wstring fromUtf8(std::string_view bytes) {
+    std::wstring text;
+    while (!bytes.empty())
+        text += takeUtf8(bytes);
+    return text;
 }
 
 std::string toUtf8(std::wstring_view text) {

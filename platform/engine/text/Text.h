@@ -15,6 +15,9 @@ std::string toBytes(std::wstring_view text);
 /** The way back. Any thread. */
 std::wstring toWide(std::string_view bytes);
 
+/** Text in UTF-8, whatever the environment says; what is none becomes U+FFFD. */
+std::wstring fromUtf8(std::string_view bytes);
+
 /** The text in UTF-8, whatever the environment says. */
 std::string toUtf8(std::wstring_view text);
 
