@@ -4,6 +4,7 @@
 #include <memory>
 #include <utility>
 
+#include "discoverer/Discoverer.h"
 #include "handle/Barrier.h"
 #include "importer/Importer.h"
 #include "importer/LookProbe.h"
@@ -17,9 +18,9 @@ IMediaPlayer* InterfaceFactory::createPlayer(void* window, unsigned int flags) {
         nullptr, [&] { return std::make_unique<engine::Player>(window, flags).release(); });
 }
 
-// This engine does not discover, and says so: null.
 IMediaDiscoverer* InterfaceFactory::createDiscoverer() {
-    return nullptr;
+    return handle::guarded<IMediaDiscoverer*>(
+        nullptr, [] { return std::make_unique<discoverer::Discoverer>().release(); });
 }
 
 IMediaImporter* InterfaceFactory::createImporter() {

@@ -32,7 +32,8 @@ TEST(MediaLook, CountsStreamsAsTheFileHasThem) {
         EXPECT_EQ(told.videoCount, sample.videoCount) << sample.name;
         EXPECT_EQ(told.audioCount, sample.audioCount) << sample.name;
         EXPECT_EQ(told.textCount, sample.textCount) << sample.name;
-        EXPECT_NEAR(std::chrono::duration<double>(told.duration).count(), 4.0, 0.1) << sample.name;
+        EXPECT_NEAR(std::chrono::duration<double>(told.duration.time).count(), 4.0, 0.1)
+            << sample.name;
         EXPECT_FALSE(told.still) << sample.name;
     }
 }

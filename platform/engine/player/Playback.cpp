@@ -168,7 +168,8 @@ void Playback::onBuffering(int percent) {
 }
 
 void Playback::onDurationChanged() {
-    const Nanoseconds duration = mReady ? mpPipeline->duration() : Nanoseconds::zero();
+    const bool isNews = mReady && !mMedium.measured;
+    const Nanoseconds duration = isNews ? mpPipeline->duration() : Nanoseconds::zero();
     if (duration == Nanoseconds::zero())
         return;
     mMedium.duration = duration;

@@ -34,6 +34,7 @@ public:
         bool live = false;      ///< does not wait for data, and cannot be stopped
         bool keyFrames = true;  ///< they can be found
         bool seamless = false;  ///< loops can be joined without a flush
+        bool measured = false;  ///< the duration is exact, whatever the pipeline reckons
         Nanoseconds duration{}; ///< zero when unknown
     };
 

@@ -21,6 +21,12 @@ namespace {
 
 constexpr std::chrono::milliseconds kOpenTime{4500};
 
+/**
+ * Of it for the first try of a file. Rarely GStreamer's threads wait for each other while a
+ * pipeline is being built, and the same file opens at once in the next one.
+ */
+constexpr std::chrono::milliseconds kFirstTryTime{2700};
+
 /** Numbers are never used again, so that late events find no wrong pipeline. */
 std::uint64_t nextPipelineNumber() {
     static std::atomic<std::uint64_t> number{0};
@@ -79,8 +85,9 @@ Session::Session(Front& front, const PlayerOptions& options, std::shared_ptr<Eng
 Session::~Session() = default;
 
 void Session::open() {
-    mOpenDeadline = SteadyClock::now() + kOpenTime;
     mMedium = toMedium(mpTicket->path());
+    mTriedAgain = mMedium.path.empty();
+    mOpenDeadline = SteadyClock::now() + (mTriedAgain ? kOpenTime : kFirstTryTime);
     if (look() && !openFixedChain())
         openPlaybin();
 }
@@ -114,6 +121,12 @@ void Session::openPlaybin() {
     start(buildPlaybinChain(mMedium.uri, mOptions));
 }
 
+void Session::tryAgain() {
+    mTriedAgain = true;
+    mOpenDeadline = SteadyClock::now() + (kOpenTime - kFirstTryTime);
+    openPlaybin();
+}
+
 void Session::start(Pipeline::Parts parts) {
     mPlayback.attach(nullptr);
     mpPipeline.reset();
@@ -136,14 +149,17 @@ void Session::becomeReady() {
     const Nanoseconds duration = findDuration();
     mReporter.setDuration(duration);
     tellOpened(duration);
-    mPlayback.begin({mLook.still, mLive, knowsKeyFrames(mLook), loopsSeamlessly(mLook), duration});
+    mPlayback.begin({mLook.still, mLive, knowsKeyFrames(mLook), loopsSeamlessly(mLook),
+                     mLook.duration.isMeasured, duration});
 }
 
 Nanoseconds Session::findDuration() const {
     if (mLook.still)
         return Nanoseconds::zero();
+    if (mLook.duration.isMeasured)
+        return mLook.duration.time;
     const Nanoseconds told = mpPipeline->duration();
-    return told > Nanoseconds::zero() ? told : mLook.duration;
+    return told > Nanoseconds::zero() ? told : mLook.duration.time;
 }
 
 void Session::tellOpened(Nanoseconds duration) {
@@ -257,10 +273,12 @@ TimePoint Session::deadline() const {
 }
 
 void Session::onDeadline() {
-    if (isOpening())
+    if (!isOpening())
+        mPlayback.onDeadline();
+    else if (mTriedAgain)
         fail(failure(kTimedOut));
     else
-        mPlayback.onDeadline();
+        tryAgain();
 }
 
 } // namespace engine

@@ -52,6 +52,7 @@ private:
     bool look();
     bool openFixedChain();
     void openPlaybin();
+    void tryAgain();
     void start(Pipeline::Parts parts);
     void becomeReady();
     [[nodiscard]] Nanoseconds findDuration() const;
@@ -76,6 +77,7 @@ private:
     probe::MediaLook mLook;
     bool mFixed = false; ///< the pipeline was planned, it did not find out by itself
     bool mLive = false;
+    bool mTriedAgain = false; ///< a pipeline that does not come up is given up next time
 
     std::unique_ptr<Pipeline> mpPipeline; ///< last, so that it goes first
 };

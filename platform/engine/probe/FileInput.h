@@ -22,6 +22,7 @@ public:
     FileInput& operator=(const FileInput&) = delete;
 
     [[nodiscard]] AVIOContext* context() const { return mContext.get(); }
+    [[nodiscard]] std::int64_t size() const { return mSize; } ///< bytes
     [[nodiscard]] bool isExhausted() const;
 
 private:

@@ -1,11 +1,11 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <chrono>
 #include <optional>
 #include <string>
-#include <string_view>
 #include <variant>
+
+#include "probe/MediaFile.h"
 
 namespace probe {
 
@@ -21,24 +21,16 @@ struct MediaLook {
         std::string codec;
     };
 
-    std::string container;               ///< libavformat's name, such as "mov,mp4,m4a,3gp,3g2,mj2"
-    bool still = false;                  ///< one picture, without time
-    bool tagged = false;                 ///< the stream begins with an ID3v2 tag
-    std::chrono::nanoseconds duration{}; ///< 0 when unknown, else maybe an estimate
-    int videoCount = 0;                  ///< without cover pictures
+    std::string container; ///< libavformat's name, such as "mov,mp4,m4a,3gp,3g2,mj2"
+    bool still = false;    ///< one picture, without time
+    bool tagged = false;   ///< the stream begins with an ID3v2 tag
+    MediaFile::Duration duration;
+    int videoCount = 0; ///< without cover pictures
     int audioCount = 0;
     int textCount = 0;
     std::optional<Video> video; ///< the first stream of its kind
     std::optional<Audio> audio;
 };
-
-/** Why a file cannot be played: a LibMediaPlayer::Result. */
-struct LookFailure {
-    int result = 0;
-};
-
-/** The look had to end before it knew; the file may be good all the same. */
-struct LookUndecided {};
 
 using LookResult = std::variant<MediaLook, LookFailure, LookUndecided>;
 

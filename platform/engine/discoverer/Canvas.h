@@ -1,0 +1,21 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <cstdint>
+#include <vector>
+
+#include "discoverer/FrameFinder.h"
+#include "discoverer/Layout.h"
+
+namespace discoverer {
+
+/** Rows of opaque pixels 0xAARRGGBB. */
+struct Canvas {
+    Size size;
+    std::vector<std::uint32_t> pixels;
+};
+
+/** Draws the picture where the layout says. Returns 0 or a LibMediaPlayer::Result. */
+int draw(const Picture& picture, const Layout& layout, Canvas& canvas);
+
+} // namespace discoverer

@@ -1,0 +1,31 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <memory>
+#include <optional>
+#include <string>
+
+#include "LibMediaPlayer/IMediaDiscoverer.h"
+#include "probe/MediaFile.h"
+
+namespace discoverer {
+
+/** Reads and draws with the FFmpeg libraries, on the caller's thread. */
+class Discoverer : public LibMediaPlayer::IMediaDiscoverer {
+public:
+    int open(const std::wstring& path) override;
+    int close() override;
+    int metadata(LibMediaPlayer::MediaMetaInfo& info) override;
+    int reserved5() override;
+    int makeImage(int64_t position, int32_t width, int32_t height,
+                  const std::wstring& path) override;
+    int reserved7() override;
+    int supportedExtensions(LibMediaPlayer::SupportedExtensions& extensions) override;
+
+private:
+    std::string mPath;
+    std::unique_ptr<probe::MediaFile> mpFile; ///< from open() to the first metadata()
+    std::optional<LibMediaPlayer::MediaMetaInfo> mInfo;
+};
+
+} // namespace discoverer

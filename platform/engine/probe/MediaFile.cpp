@@ -1,0 +1,176 @@
+// SPDX-License-Identifier: MIT
+#include "probe/MediaFile.h"
+
+#include <algorithm>
+#include <array>
+#include <cerrno>
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <utility>
+
+#include "LibMediaPlayer/Result.h"
+#include "base/UniqueFd.h"
+#include "probe/Duration.h"
+#include "probe/Formats.h"
+
+namespace probe {
+
+using namespace LibMediaPlayer;
+
+namespace {
+
+/** Below it a few bytes agree by chance. */
+constexpr int kLeastScore = AVPROBE_SCORE_RETRY / 2;
+
+int resultOfErrno(int error) {
+    switch (error) {
+    case EACCES:
+    case EPERM:
+        return kAccessDenied;
+    case ENOENT:
+    case ENOTDIR:
+    case ENAMETOOLONG:
+    case ELOOP:
+        return kNotFound;
+    default:
+        return kNotAvailable;
+    }
+}
+
+struct OpenedFile {
+    qns::UniqueFd file;
+    std::int64_t size = 0;
+};
+
+/** A pipe or a device could block, or be set going, by opening it alone. */
+std::variant<OpenedFile, LookFailure> openRegularFile(const std::string& path) {
+    struct stat status {};
+    if (::stat(path.c_str(), &status) != 0)
+        return LookFailure{resultOfErrno(errno)};
+    if (!S_ISREG(status.st_mode))
+        return LookFailure{kNotMedia};
+    qns::UniqueFd file(::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK | O_NOCTTY));
+    if (!file)
+        return LookFailure{resultOfErrno(errno)};
+    if (::fstat(file.get(), &status) != 0 || !S_ISREG(status.st_mode) || status.st_size == 0)
+        return LookFailure{kNotMedia};
+    return OpenedFile{std::move(file), status.st_size};
+}
+
+bool isPlayable(const AVStream& stream) {
+    return isVideo(stream) || isAudio(stream);
+}
+
+} // namespace
+
+MediaFile::MediaFile(qns::UniqueFd file, std::int64_t size, Bounds bounds)
+    : mInput(std::move(file), size, bounds.bytes, bounds.time) {}
+
+MediaFile::Opened MediaFile::open(const std::string& path, Bounds bounds) {
+    av_log_set_level(AV_LOG_QUIET);
+    auto opened = openRegularFile(path);
+    if (const auto* const failure = std::get_if<LookFailure>(&opened))
+        return *failure;
+    auto& file = std::get<OpenedFile>(opened);
+    std::unique_ptr<MediaFile> pMedia(new MediaFile(std::move(file.file), file.size, bounds));
+    if (const int result = pMedia->readHeader(); result != kOk)
+        return pMedia->failed(result);
+    return pMedia;
+}
+
+MediaFile::Opened MediaFile::failed(int result) const {
+    if (mInput.isExhausted())
+        return LookUndecided{};
+    return LookFailure{result};
+}
+
+int MediaFile::readHeader() {
+    if (!findFormat())
+        return kNotMedia;
+    if (openInput() < 0)
+        return kDamaged;
+    if (!isClear())
+        analyse();
+    if (mContext->nb_streams == 0)
+        return kDamaged;
+    const AVStream* const* const streams = mContext->streams;
+    const bool plays = std::any_of(streams, streams + mContext->nb_streams,
+                                   [](const AVStream* stream) { return isPlayable(*stream); });
+    return plays ? kOk : kNotMedia;
+}
+
+bool MediaFile::findFormat() {
+    std::array<unsigned char, 3> head{};
+    avio_read(mInput.context(), head.data(), head.size());
+    mTagged = head[0] == 'I' && head[1] == 'D' && head[2] == '3';
+    avio_seek(mInput.context(), 0, SEEK_SET);
+    // Without the file's name: its ending proves nothing.
+    const int score = av_probe_input_buffer2(mInput.context(), &mpFormat, nullptr, nullptr, 0, 0);
+    return mpFormat && score >= kLeastScore && isTrusted(mpFormat->name);
+}
+
+int MediaFile::openInput() {
+    // The library frees a context that it could not open.
+    AVFormatContext* context = avformat_alloc_context();
+    context->pb = mInput.context();
+    context->interrupt_callback = {isInterrupted, &mInput};
+    context->probesize = 1024 * 1024;
+    const int error = avformat_open_input(&context, nullptr, mpFormat, nullptr);
+    mContext = FormatContext(kAdopt, context);
+    return error;
+}
+
+/** True when the file's header has told all that playing needs. */
+bool MediaFile::isClear() const {
+    return mContext->nb_streams > 0 && (mContext->ctx_flags & AVFMTCTX_NOHEADER) == 0 &&
+           (mContext->duration > 0 || isPicture());
+}
+
+bool MediaFile::isPicture() const {
+    return isPictureFormat(mpFormat->name);
+}
+
+void MediaFile::analyse() {
+    if (std::exchange(mAnalysed, true))
+        return;
+    mContext->probesize = 256 * 1024;
+    mContext->max_analyze_duration = AV_TIME_BASE / 2;
+    const std::int64_t told = mContext->duration;
+    avformat_find_stream_info(mContext.get(), nullptr);
+    if (told > 0)
+        mContext->duration = told;
+}
+
+bool MediaFile::isEstimate() const {
+    return mContext->duration <= 0 ||
+           (mAnalysed && mContext->duration_estimation_method == AVFMT_DURATION_FROM_BITRATE);
+}
+
+const MediaFile::Duration& MediaFile::duration() {
+    if (std::exchange(mDurationKnown, true) || isPicture())
+        return mDuration;
+    mDuration.time = std::chrono::microseconds(std::max<std::int64_t>(mContext->duration, 0));
+    if (!isEstimate()) {
+        mDuration.isMeasured =
+            mAnalysed && mContext->duration_estimation_method == AVFMT_DURATION_FROM_PTS;
+        return mDuration;
+    }
+    const auto counted = countDuration(*mContext.get());
+    if (mInput.isExhausted() || counted == std::chrono::nanoseconds::zero())
+        return mDuration;
+    return mDuration = {counted, true};
+}
+
+bool isVideo(const AVStream& stream) {
+    return stream.codecpar->codec_type == AVMEDIA_TYPE_VIDEO && !isCover(stream);
+}
+
+bool isCover(const AVStream& stream) {
+    return (stream.disposition & AV_DISPOSITION_ATTACHED_PIC) != 0;
+}
+
+bool isAudio(const AVStream& stream) {
+    return stream.codecpar->codec_type == AVMEDIA_TYPE_AUDIO;
+}
+
+} // namespace probe
