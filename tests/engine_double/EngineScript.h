@@ -23,6 +23,9 @@
  *     engine.expectCall("player open \"/a b.mp4\" 2", "return 0");
  *     engine.notify(opened);
  *
+ * The discoverers of a process have a script of their own, which the environment variable
+ * QNS_DISCOVERER_DOUBLE names; their calls look as ScriptedDiscoverer describes.
+ *
  * One player at a time; when it has gone, the next one is waited for. Nothing here waits for
  * time to pass, only, at most kPatience, for the engine; when that is too long the test fails.
  * When the script goes, a blocked call returns 0. For one thread, which must not be the one that

@@ -5,6 +5,7 @@
 #include <memory>
 #include <string>
 
+#include "tests/engine_double/ScriptedDiscoverer.h"
 #include "tests/engine_double/ScriptedPlayer.h"
 
 namespace LibMediaPlayer {
@@ -37,7 +38,7 @@ IMediaPlayer* InterfaceFactory::createPlayer(void* window, unsigned int flags) {
 }
 
 IMediaDiscoverer* InterfaceFactory::createDiscoverer() {
-    return nullptr;
+    return ScriptedDiscoverer::create().release();
 }
 
 IMediaImporter* InterfaceFactory::createImporter() {
