@@ -19,6 +19,11 @@ void ArgumentReader::read(std::string& field) {
     field.assign(text, ::strnlen(text, mInfo.value.rawLength));
 }
 
+void ArgumentReader::readBytes(std::string& field) {
+    if (decodeNext() && mInfo.type == UNPACK_RAW)
+        field.assign(reinterpret_cast<const char*>(mInfo.ptr), mInfo.value.rawLength);
+}
+
 bool ArgumentReader::decodeNext() {
     if (mLeft == 0)
         return false;

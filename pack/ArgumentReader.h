@@ -37,8 +37,10 @@ public:
             field = static_cast<T>(mInfo.value.unsignedInt);
     }
     void read(std::wstring& field);
-    /** The raw's bytes as they are. */
+    /** The text's bytes as they are. */
     void read(std::string& field);
+    /** All of a raw's bytes, NULs too. */
+    void readBytes(std::string& field);
 
 private:
     /** False when the field keeps its preset. */

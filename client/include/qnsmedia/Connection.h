@@ -49,6 +49,7 @@ public:
     void onError(std::function<void(std::exception_ptr error)> handler);
 
 private:
+    friend class Discoverer;
     friend class Importer;
     friend class Player;
     std::shared_ptr<Link> mpLink;
