@@ -7,9 +7,11 @@
 #include "main/MediaServiceFactory.h"
 #include "main/MediaServiceMain.h"
 #include "main/SignalHandler.h"
+#include "main/StandardDescriptors.h"
 #include "main/SystemSingleCaught.h"
 
 int main(int argc, char** argv) {
+    openStandardDescriptors();
     const CommandLine commandLine = readCommandLine(argc, argv);
     if (commandLine.exitStatus)
         return *commandLine.exitStatus;

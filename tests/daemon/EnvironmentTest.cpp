@@ -2,7 +2,6 @@
 #include <filesystem>
 #include <fstream>
 #include <string>
-#include <vector>
 
 #include "tests/daemon/support/DaemonTest.h"
 
@@ -11,6 +10,8 @@ using testing::HasSubstr;
 using testing::IsEmpty;
 
 namespace {
+
+constexpr const char* kLogFiles[] = {"/var/log/qn_ope.log", "/var/log/qn_ope_debug.log"};
 
 /** A daemon that finds something unusual around it. The tests start it themselves. */
 class Environment : public DaemonTest {
@@ -72,18 +73,28 @@ TEST_F(Environment, ALogDaemonThatStopsReadingHoldsUpNobody) {
     client.callAccepted(request::kPlay, callback::kPlay);
 }
 
-TEST_F(Environment, UnwritableLogFilesHarmNobody) {
-    const std::vector<std::filesystem::path> files{"/var/log/qn_ope.log",
-                                                   "/var/log/qn_ope_debug.log"};
-    for (const auto& file : files) {
-        std::filesystem::remove(file);
-        std::filesystem::create_directory(file);
+/** Folders in the places of the log files, until the end of the scope. */
+class UnwritableLogFiles {
+public:
+    UnwritableLogFiles() {
+        for (const auto* file : kLogFiles) {
+            std::filesystem::remove(file);
+            std::filesystem::create_directory(file);
+        }
     }
+    ~UnwritableLogFiles() {
+        for (const auto* file : kLogFiles)
+            std::filesystem::remove(file);
+    }
+    UnwritableLogFiles(const UnwritableLogFiles&) = delete;
+    UnwritableLogFiles& operator=(const UnwritableLogFiles&) = delete;
+};
+
+TEST_F(Environment, UnwritableLogFilesHarmNobody) {
+    const UnwritableLogFiles files;
     startServing(withEngineDouble());
     expectService();
     EXPECT_EQ(mpDaemon->terminate(), 0);
-    for (const auto& file : files)
-        std::filesystem::remove(file);
 }
 
 TEST_F(Environment, ClosedStandardDescriptorsAreNotTakenForConnections) {
@@ -91,6 +102,18 @@ TEST_F(Environment, ClosedStandardDescriptorsAreNotTakenForConnections) {
     options.output = DaemonOptions::Output::closed;
     start(options);
     expectService(100);
+    for (const auto* file : kLogFiles)
+        EXPECT_EQ(std::filesystem::file_size(file), 0U) << file;
+}
+
+TEST_F(Environment, ClosedStandardDescriptorsAreNotTakenForSignals) {
+    const UnwritableLogFiles files;
+    auto options = withEngineDouble();
+    options.output = DaemonOptions::Output::closed;
+    start(options);
+    expectService();
+    EXPECT_THAT(mSyslog.lines("onSystemSingleCaught"), IsEmpty());
+    EXPECT_EQ(mpDaemon->terminate(), 0);
 }
 
 TEST_F(Environment, OutputThatNobodyReadsHoldsUpNobody) {
