@@ -6,6 +6,7 @@
 #include <csignal>
 #include <cstdlib>
 #include <fcntl.h>
+#include <initializer_list>
 #include <string>
 #include <syslog.h>
 #include <thread>
@@ -97,12 +98,17 @@ void runCallbacks() {
         runCallback();
 }
 
-/** It takes no signals itself, so that no read is interrupted. */
+/**
+ * It takes no signals itself, so that no read is interrupted; but a crash on it is one like any
+ * other.
+ */
 bool startThreadWithoutSignals(void (*body)()) {
-    sigset_t all;
+    sigset_t blocked;
     sigset_t before;
-    sigfillset(&all);
-    pthread_sigmask(SIG_SETMASK, &all, &before);
+    sigfillset(&blocked);
+    for (const int crash : {SIGSEGV, SIGBUS, SIGFPE})
+        sigdelset(&blocked, crash);
+    pthread_sigmask(SIG_SETMASK, &blocked, &before);
     const bool started = PTC::barrier([body] { std::thread(body).detach(); });
     pthread_sigmask(SIG_SETMASK, &before, nullptr);
     return started;

@@ -4,6 +4,7 @@
 #include <array>
 #include <cerrno>
 #include <csignal>
+#include <cstddef>
 #include <gmock/gmock.h>
 #include <string>
 #include <sys/resource.h>
@@ -15,7 +16,22 @@
 #include "qnsys.h"
 #include "tests/tools/LogSocket.h"
 
+using ::testing::EndsWith;
 using ::testing::HasSubstr;
+using ::testing::StartsWith;
+
+static bool gNoMemory = false;
+
+/** Linked in the place of malloc(3) as this program's own code calls it. */
+extern "C" {
+void* __real_malloc(std::size_t size);
+void* __wrap_malloc(std::size_t size) {
+    if (!gNoMemory)
+        return __real_malloc(size);
+    errno = ENOMEM;
+    return nullptr;
+}
+}
 
 /** Its name is to be seen in the back-trace. */
 __attribute__((noinline)) void crashInThisFunction(int signal) {
@@ -92,7 +108,9 @@ class IgnoredSignals : public ::testing::TestWithParam<int> {};
 TEST_P(IgnoredSignals, DoNotEndTheProcess) {
     const Outcome outcome = inChild([] {
         registerSystemSignalHandler(exitWithSeven, "test");
-        ::raise(GetParam());
+        // The thread of the callbacks is given the time to run one, if it were to.
+        for (int i = 0; i < 100'000; ++i)
+            ::raise(GetParam());
     });
     EXPECT_TRUE(WIFEXITED(outcome.status));
     EXPECT_EQ(WEXITSTATUS(outcome.status), 0);
@@ -154,6 +172,29 @@ TEST_P(CrashSignals, PrintABackTraceAndAbort) {
 
 INSTANTIATE_TEST_SUITE_P(All, CrashSignals, ::testing::Values(SIGSEGV, SIGBUS, SIGFPE, SIGQUIT));
 
+int gCrash = 0;
+
+void crashInTheCallback() {
+    crashInThisFunction(gCrash);
+    ::_exit(7);
+}
+
+class CrashesOfTheCallback : public ::testing::TestWithParam<int> {};
+
+TEST_P(CrashesOfTheCallback, AreCrashesLikeAnyOther) {
+    const Outcome outcome = inChild([] {
+        gCrash = GetParam();
+        registerSystemSignalHandler(crashInTheCallback, "test");
+        ::raise(SIGTERM);
+        waitForTheEnd();
+    });
+    EXPECT_TRUE(WIFSIGNALED(outcome.status));
+    EXPECT_EQ(WTERMSIG(outcome.status), SIGABRT);
+    EXPECT_THAT(outcome.output, HasSubstr("crashInThisFunction"));
+}
+
+INSTANTIATE_TEST_SUITE_P(All, CrashesOfTheCallback, ::testing::Values(SIGSEGV, SIGBUS, SIGFPE));
+
 TEST(SignalHandler, LeavesSignalsBeyondItsTableAlone) {
     const Outcome outcome = inChild([] {
         registerSystemSignalHandler(exitWithSeven, "test");
@@ -186,6 +227,28 @@ TEST(SignalHandler, IsNotInstalledAgainByASecondRegistration) {
         ::_exit(handlerOf(SIGTERM) == SIG_IGN ? 0 : 1);
     });
     EXPECT_EQ(outcome.status, 0);
+}
+
+TEST(SignalHandler, IsNotInstalledWithoutMemoryButSaysSo) {
+    LogSocket log;
+    const Outcome outcome = inChild([] {
+        INIT_LOGGING(L"test");
+        const auto crashHandler = handlerOf(SIGSEGV); // a sanitizer has one
+        gNoMemory = true;
+        registerSystemSignalHandler(exitWithSeven, "test");
+        gNoMemory = false;
+        registerSystemSignalHandler(exitWithSeven, "test"); // comes too late
+        for (const int signal : {SIGTERM, SIGINT, SIGPIPE, SIGPWR})
+            if (handlerOf(signal) != SIG_DFL)
+                ::_exit(signal);
+        if (handlerOf(SIGSEGV) != crashHandler)
+            ::_exit(SIGSEGV);
+    });
+    EXPECT_EQ(outcome.status, 0);
+    const std::string line = log.next().value_or("");
+    EXPECT_THAT(line, StartsWith("<131>"));
+    EXPECT_THAT(line, EndsWith("]: malloc: Cannot allocate memory"));
+    EXPECT_EQ(log.waiting(), std::nullopt);
 }
 
 TEST(SignalHandler, LeavesTheErrorNumberAlone) {
