@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: MIT
 #include "ptc/LTReceiver.h"
 
+#include "tests/ptc/CountedWaits.h"
+#include "tests/ptc/Eventually.h"
 #include "tests/ptc/Gate.h"
 #include "tests/ptc/ProcessState.h"
 #include "tests/ptc/TestAdapter.h"
@@ -56,9 +58,11 @@ TEST(LTReceiver, DispatchesEventsThatWaitedInOnePassAndInOrder) {
     Gate mayReturn;
     Gate done;
     std::vector<long> methods;
+    std::vector<int> wakeUps;
     LTReceiver receiver(8);
     receiver.addAdapter(new TestAdapter(1, [&](PTC::Event& event) {
         methods.push_back(event.methodId);
+        wakeUps.push_back(counted_waits::wakeUps());
         if (event.methodId == 0) {
             started.open();
             EXPECT_TRUE(mayReturn.wait());
@@ -73,6 +77,7 @@ TEST(LTReceiver, DispatchesEventsThatWaitedInOnePassAndInOrder) {
     mayReturn.open();
     ASSERT_TRUE(done.wait());
     EXPECT_EQ(methods, (std::vector<long>{0, 1, 2, 3}));
+    EXPECT_EQ(wakeUps, std::vector<int>(4, wakeUps.front()));
 }
 
 TEST(LTReceiver, KeepsTheOrderOfEachOfEightThreadsAndCallsOneAtATime) {
@@ -203,4 +208,39 @@ TEST(LTReceiver, LetsACallPostAnEventToItsOwnReceiver) {
     }));
     receiver.recv(makeEvent(1, 0).release());
     EXPECT_TRUE(done.wait());
+}
+
+TEST(LTReceiver, KeepsAnEventWhosePostFailedForTheNextOne) {
+    Gate done;
+    std::vector<long> methods;
+    LTReceiver receiver(8);
+    receiver.addAdapter(new TestAdapter(1, [&](PTC::Event& event) {
+        methods.push_back(event.methodId);
+        if (event.methodId == 2)
+            done.open();
+    }));
+    {
+        const counted_waits::FailingPosts failing;
+        receiver.recv(makeEvent(1, 1).release());
+    }
+    EXPECT_FALSE(receiver.isQueueEmpty());
+    waitForWorker(receiver, 2, done);
+    EXPECT_EQ(methods, (std::vector<long>{1, 2}));
+}
+
+// What is queued for it is freed all the same, which is for the sanitizers to find.
+TEST(LTReceiver, EndsItsWorkerQuietlyWhenThatCanWaitNoLonger) {
+    const auto threads = threadCount();
+    Gate done;
+    auto* const adapter = new TestAdapter(1, [&done](PTC::Event&) {
+        counted_waits::failNextWait();
+        done.open();
+    });
+    LTReceiver receiver(8);
+    receiver.addAdapter(adapter);
+    waitForWorker(receiver, 1, done);
+    ASSERT_TRUE(eventually([threads] { return threadCount() == threads; }));
+    receiver.recv(makeEvent(1, 2).release());
+    EXPECT_FALSE(receiver.isQueueEmpty());
+    EXPECT_EQ(adapter->calls, 1);
 }

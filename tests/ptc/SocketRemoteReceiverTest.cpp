@@ -3,6 +3,7 @@
 
 #include "ptc/LoopbackSocket.h"
 #include "tests/ptc/Eventually.h"
+#include "tests/ptc/FailingCalls.h"
 #include "tests/ptc/Gate.h"
 #include "tests/ptc/Inbox.h"
 #include "tests/ptc/Peer.h"
@@ -15,9 +16,11 @@
 #include <atomic>
 #include <chrono>
 #include <fcntl.h>
+#include <filesystem>
 #include <limits>
 #include <memory>
 #include <mutex>
+#include <netinet/in.h>
 #include <netinet/tcp.h>
 #include <poll.h>
 #include <random>
@@ -75,6 +78,34 @@ void writeUntilReaderIsStuck(const Peer& peer) {
     while (::poll(&writable, 1, 300) == 1 &&
            ::send(peer.socket(), &byte, 1, MSG_NOSIGNAL | MSG_DONTWAIT) == 1) {
     }
+}
+
+/** This process's listening socket, or -1. */
+int listeningSocket() {
+    for (const auto& entry : std::filesystem::directory_iterator("/proc/self/fd")) {
+        const int descriptor = std::stoi(entry.path().filename());
+        int listens = 0;
+        socklen_t length = sizeof(listens);
+        if (getsockopt(descriptor, SOL_SOCKET, SO_ACCEPTCONN, &listens, &length) == 0 && listens)
+            return descriptor;
+    }
+    return -1;
+}
+
+int optionOf(int socket, int option) {
+    int value = -1;
+    socklen_t length = sizeof(value);
+    EXPECT_EQ(getsockopt(socket, SOL_SOCKET, option, &value, &length), 0);
+    return value;
+}
+
+/** The lines that a server reports that cannot start. */
+std::vector<std::string> linesOfAFailedStart() {
+    LineLog log;
+    SocketRemoteReceiver server(0, [&log](std::string_view line) { log.add(line); });
+    EXPECT_FALSE(server.initialize(kPort));
+    EXPECT_EQ(listeningSocket(), -1);
+    return log.lines();
 }
 
 /** How long the call took. */
@@ -154,6 +185,25 @@ TEST_F(SocketServer, SetsItsConnectionsUp) {
     EXPECT_FALSE(fcntl(accepted, F_GETFL) & O_NONBLOCK);
 }
 
+TEST_F(SocketServer, ListensOnLoopbackAloneWithRoomForTenClients) {
+    const int socket = listeningSocket();
+    ASSERT_GE(socket, 0);
+    sockaddr_in address{};
+    socklen_t length = sizeof(address);
+    ASSERT_EQ(getsockname(socket, reinterpret_cast<sockaddr*>(&address), &length), 0);
+    EXPECT_EQ(address.sin_addr.s_addr, htonl(INADDR_LOOPBACK));
+    EXPECT_EQ(address.sin_port, htons(kPort));
+    EXPECT_EQ(optionOf(socket, SO_TYPE), SOCK_STREAM);
+    EXPECT_EQ(optionOf(socket, SO_PROTOCOL), IPPROTO_TCP);
+    EXPECT_EQ(optionOf(socket, SO_REUSEADDR), 1);
+    EXPECT_EQ(optionOf(socket, SO_RCVBUF), 2 * 122880) << "the kernel doubles what is asked for";
+    tcp_info info{};
+    length = sizeof(info);
+    ASSERT_EQ(getsockopt(socket, IPPROTO_TCP, TCP_INFO, &info, &length), 0);
+    EXPECT_EQ(info.tcpi_sacked, 10u) << "where the kernel tells a listening socket's backlog";
+    EXPECT_TRUE(fcntl(socket, F_GETFD) & FD_CLOEXEC);
+}
+
 TEST_F(SocketServer, DeliversTheLargestPayload) {
     std::string payload(PTC::kMaxPayloadSize, 'a');
     payload.front() = 'f';
@@ -161,6 +211,21 @@ TEST_F(SocketServer, DeliversTheLargestPayload) {
     auto peer = connectedPeer(kPort);
     ASSERT_TRUE(peer.write(packetBytes(kReceiverId, 4, payload)));
     EXPECT_EQ(mpInbox->waitFor(1).at(0).payload, payload);
+}
+
+TEST_F(SocketServer, CountsOnlyTheBytesThatItCouldAcknowledge) {
+    auto peer = connectedPeer(kPort);
+    const auto bytes = packetBytes(kReceiverId, 4, "payload");
+    ASSERT_TRUE(peer.writeAcknowledged(bytes.substr(0, 100)));
+    for (const std::size_t lost : {1, 5000, 20000}) {
+        failing_calls::failAcknowledgements(1);
+        ASSERT_TRUE(peer.write(std::string(lost, 'x')));
+        ASSERT_TRUE(eventually([] { return failing_calls::acknowledgementsToFail() == 0; }));
+    }
+    ASSERT_TRUE(peer.writeAcknowledged(bytes.substr(100)));
+    const auto messages = mpInbox->waitFor(1);
+    ASSERT_EQ(messages.size(), 1u);
+    EXPECT_EQ(messages[0].payload, "payload");
 }
 
 TEST_F(SocketServer, IgnoresPacketsOfWrongSizeButAcknowledgesThem) {
@@ -414,6 +479,37 @@ TEST_F(SocketServer, EndsWhileAReaderWaitsForRoomForItsAcknowledgement) {
     EXPECT_TRUE(other.writeAcknowledged(packetBytes(kReceiverId, 4, "x")))
         << "a stuck client holds up nobody else";
     mServer.reset();
+}
+
+TEST(SocketRemoteReceiver, SaysWhichStepOfItsStartFailed) {
+    using Lines = std::vector<std::string>;
+    {
+        const failing_calls::FailingOption failing(SO_REUSEADDR);
+        EXPECT_EQ(linesOfAFailedStart(), Lines{"[Error]Socket Server reuse address failed!"});
+    }
+    {
+        const failing_calls::FailingOption failing(SO_RCVBUF);
+        EXPECT_EQ(linesOfAFailedStart(), Lines{"[Error]Socket Server set Rec buffer failed!"});
+    }
+    {
+        const failing_calls::FailingListen failing;
+        EXPECT_EQ(linesOfAFailedStart(), Lines{"[Error]create socket server listenner failed!"});
+    }
+    const DescriptorLimit limit(0);
+    LineLog log;
+    SocketRemoteReceiver server(0, [&log](std::string_view line) { log.add(line); });
+    EXPECT_FALSE(server.initialize(kPort));
+    EXPECT_EQ(log.lines(), Lines{"[Error]Socket Server create failed!"});
+}
+
+TEST(SocketRemoteReceiver, MayBeStartedAgainAfterAStartThatFailed) {
+    SocketRemoteReceiver server(0, [](std::string_view) {});
+    {
+        const failing_calls::FailingListen failing;
+        EXPECT_FALSE(server.initialize(kPort));
+    }
+    EXPECT_TRUE(server.initialize(kPort));
+    EXPECT_TRUE(connectedPeer(kPort).writeAcknowledged("x"));
 }
 
 TEST(SocketRemoteReceiver, NeedNotBeStarted) {

@@ -6,6 +6,7 @@
 #include "ptc/LoopbackSocket.h"
 #include "ptc/SocketRemoteReceiver.h"
 #include "tests/ptc/Eventually.h"
+#include "tests/ptc/FailingCalls.h"
 #include "tests/ptc/Gate.h"
 #include "tests/ptc/Inbox.h"
 #include "tests/ptc/Peer.h"
@@ -218,6 +219,9 @@ TEST_F(SocketSender, SetsItsConnectionUp) {
     ASSERT_EQ(getsockopt(socket, SOL_SOCKET, SO_RCVBUF, &bufferSize, &length), 0);
     EXPECT_NE(noDelay, 0);
     EXPECT_EQ(bufferSize, 2 * 122880) << "the kernel doubles what is asked for";
+    int reuse = 0;
+    ASSERT_EQ(getsockopt(socket, SOL_SOCKET, SO_REUSEADDR, &reuse, &length), 0);
+    EXPECT_EQ(reuse, 1);
     EXPECT_TRUE(fcntl(socket, F_GETFD) & FD_CLOEXEC);
 }
 
@@ -332,6 +336,27 @@ TEST(SocketRemoteSender, PrintsThatThereIsNoSocketLeft) {
         EXPECT_FALSE(sender.initialize(kPort));
     }
     EXPECT_EQ(testing::internal::GetCapturedStdout(), "[Error]Socket Server create failed!\n");
+}
+
+TEST(SocketRemoteSender, PrintsWhichOptionFailedAndClosesItsSocket) {
+    const BareServer client(kPort);
+    const auto descriptors = descriptorCount();
+    const auto outputOfAFailedStart = [] {
+        SocketRemoteSender sender(kModule);
+        testing::internal::CaptureStdout();
+        EXPECT_FALSE(sender.initialize(kPort));
+        EXPECT_EQ(sender.socket(), -1);
+        return testing::internal::GetCapturedStdout();
+    };
+    {
+        const failing_calls::FailingOption failing(SO_REUSEADDR);
+        EXPECT_EQ(outputOfAFailedStart(), "[Error]Socket client reuse address failed!\n");
+    }
+    {
+        const failing_calls::FailingOption failing(SO_RCVBUF);
+        EXPECT_EQ(outputOfAFailedStart(), "[Error]Socket client set send buffer failed!\n");
+    }
+    EXPECT_EQ(descriptorCount(), descriptors);
 }
 
 TEST(Transport, CarriesEventsToAnObjectInAnotherProcess) {
