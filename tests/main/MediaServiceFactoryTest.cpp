@@ -12,11 +12,17 @@
 #include <sys/socket.h>
 
 #include "base/UniqueFd.h"
+#include "define/DiscovererMethods.h"
+#include "define/ImporterMethods.h"
 #include "define/ObjectIds.h"
 #include "define/PlayerMethods.h"
+#include "discoverer/IMediaDiscovererService.h"
 #include "discoverer/MediaDiscovererServiceCallBackRemoteProxy.h"
+#include "importer/IMediaImporterService.h"
+#include "importer/IMediaImporterServiceNotify.h"
 #include "importer/MediaImporterServiceCallBackRemoteProxy.h"
 #include "importer/MediaImporterServiceNotifyRemoteProxy.h"
+#include "pack/CSimpleBuffer.h"
 #include "player/IMediaPlayerService.h"
 #include "player/IMediaPlayerServiceNotify.h"
 #include "player/MediaPlayerServiceCallBackRemoteProxy.h"
@@ -27,6 +33,8 @@
 #include "ptc/SocketRemoteSender.h"
 
 using namespace MediaServiceDefine;
+using testing::Mock;
+using testing::StrictMock;
 
 namespace {
 
@@ -161,71 +169,125 @@ TEST_F(ServingFactory, WithoutItsPortSaysSoAndServesWhenTriedAgain) {
     EXPECT_EQ(mFactory.getRRIdentity(), 1008);
 }
 
+TEST_F(ServingFactory, SetsTheAllocationOfArgumentBlocks) {
+    CSimpleBuffer operations;
+    operations.simplebuffer_system_init(
+        100, [](unsigned long) -> void* { return nullptr; }, [](void*) {});
+    EXPECT_TRUE(mFactory.initialize());
+    simplebuffer buffer{};
+    EXPECT_NE(operations.simplebuffer_checksize(&buffer, 1), nullptr);
+    EXPECT_EQ(buffer.alloc, 1u + 4u);
+    operations.simplebuffer_destroy(&buffer);
+}
+
 TEST_F(ServingFactory, MayBeInitializedTwice) {
     EXPECT_TRUE(mFactory.initialize());
     EXPECT_TRUE(mFactory.initialize());
     EXPECT_EQ(mFactory.getRRIdentity(), 1008);
 }
 
-/** Tells which requests come, and its end. */
-class PlayerDouble : public IMediaPlayerService {
+/** The services' places. Each tells its end. */
+class DiscovererMock : public IMediaDiscovererService {
 public:
-    explicit PlayerDouble(bool& isDeleted) : mIsDeleted(isDeleted) {}
-    ~PlayerDouble() override { mIsDeleted = true; }
-
-    void initializePlayer(int) override {}
-    void openPlayer(_tagFileName) override {}
-    void closePlayer(int) override {}
-    void play(int) override { mPlayed.set_value(); }
-    void pause(int) override {}
-    void seek(_tagSeekParam) override {}
-    void getPlayerStatus(int) override {}
-    void setRepeat(_tagRepeatParam) override {}
-    void powerOffMediaPlayer(int) override {}
-    void registerCallBack(IMediaPlayerServiceCallBack*) override {}
-    void registerNotify(_tagIMediaPlayerServiceNotify) override {}
-    void unregisterCallBack(int) override {}
-    void unregisterNotify(int) override {}
-    void setSystemFormat(_emMediaServiceSystemFormat) override {}
-
-    std::future<void> played() { return mPlayed.get_future(); }
-
-private:
-    bool& mIsDeleted;
-    std::promise<void> mPlayed;
+    ~DiscovererMock() override { died(); }
+    MOCK_METHOD(void, died, ());
+    MOCK_METHOD(void, initializeDiscoverer, (int), (override));
+    MOCK_METHOD(void, openDiscoverer, (_tagFileName), (override));
+    MOCK_METHOD(void, closeDiscoverer, (int), (override));
+    MOCK_METHOD(void, getMetadata, (int), (override));
+    MOCK_METHOD(void, getImage, (_tagImageParam), (override));
+    MOCK_METHOD(void, getSupportedExtensions, (int), (override));
+    MOCK_METHOD(void, registerCallBack, (IMediaDiscovererServiceCallBack*), (override));
+    MOCK_METHOD(void, unregisterCallBack, (int), (override));
 };
 
-void* asService(IMediaPlayerService* service) {
-    return service;
-}
+class ImporterMock : public IMediaImporterService {
+public:
+    ~ImporterMock() override { died(); }
+    MOCK_METHOD(void, died, ());
+    MOCK_METHOD(void, initializeImporter, (int), (override));
+    MOCK_METHOD(void, import, (_tagImportParam), (override));
+    MOCK_METHOD(void, cancel, (int), (override));
+    MOCK_METHOD(void, getImporterStatus, (int), (override));
+    MOCK_METHOD(void, registerCallBack, (IMediaImporterServiceCallBack*), (override));
+    MOCK_METHOD(void, registerNotify, (_tagIMediaImporterServiceNotify), (override));
+    MOCK_METHOD(void, unregisterCallBack, (int), (override));
+    MOCK_METHOD(void, unregisterNotify, (int), (override));
+};
 
-TEST(RegisteredService, OfTheFirstRegistrationIsServedAndDeletedWithTheFactory) {
-    bool isDeleted = false;
+class PlayerMock : public IMediaPlayerService {
+public:
+    ~PlayerMock() override { died(); }
+    MOCK_METHOD(void, died, ());
+    MOCK_METHOD(void, initializePlayer, (int), (override));
+    MOCK_METHOD(void, openPlayer, (_tagFileName), (override));
+    MOCK_METHOD(void, closePlayer, (int), (override));
+    MOCK_METHOD(void, play, (int), (override));
+    MOCK_METHOD(void, pause, (int), (override));
+    MOCK_METHOD(void, seek, (_tagSeekParam), (override));
+    MOCK_METHOD(void, getPlayerStatus, (int), (override));
+    MOCK_METHOD(void, setRepeat, (_tagRepeatParam), (override));
+    MOCK_METHOD(void, powerOffMediaPlayer, (int), (override));
+    MOCK_METHOD(void, registerCallBack, (IMediaPlayerServiceCallBack*), (override));
+    MOCK_METHOD(void, registerNotify, (_tagIMediaPlayerServiceNotify), (override));
+    MOCK_METHOD(void, unregisterCallBack, (int), (override));
+    MOCK_METHOD(void, unregisterNotify, (int), (override));
+    MOCK_METHOD(void, setSystemFormat, (_emMediaServiceSystemFormat), (override));
+};
+
+/** Sends requests whose argument is a client id below 128. */
+class Client {
+public:
+    Client() { EXPECT_TRUE(mSender.initialize(kServiceIdentity)); }
+
+    template<typename Method>
+    void request(long objectId, Method method, char clientId) {
+        mSender.send(new PTC::Event(objectId, static_cast<long>(method), &clientId, sizeof clientId,
+                                    true, false));
+    }
+
+private:
+    SocketRemoteSender mSender{kThreadedReceiverId};
+};
+
+TEST(RegisteredServices, AreServedUnderTheirIdsAndDeletedWithTheFactory) {
+    auto* const discoverer = new StrictMock<DiscovererMock>;
+    auto* const importer = new StrictMock<ImporterMock>;
+    auto* const player = new StrictMock<PlayerMock>;
     {
         MediaServiceFactory factory;
-        auto* player = new PlayerDouble(isDeleted);
-        auto played = player->played();
-        factory.RegisterObject(kPlayerAdapterId, asService(player));
-        factory.RegisterObject(kPlayerAdapterId, &factory);      // comes too late
+        factory.RegisterObject(kPlayerAdapterId, static_cast<IMediaPlayerService*>(player));
+        factory.RegisterObject(kImporterAdapterId, static_cast<IMediaImporterService*>(importer));
+        factory.RegisterObject(kDiscovererAdapterId,
+                               static_cast<IMediaDiscovererService*>(discoverer));
+        for (const long second : {kPlayerAdapterId, kImporterAdapterId, kDiscovererAdapterId})
+            factory.RegisterObject(second, &factory);            // comes too late
         factory.RegisterObject(kDiscovererCallBackId, &factory); // there is no such service
         ASSERT_TRUE(factory.initialize());
 
-        SocketRemoteSender client(kThreadedReceiverId);
-        ASSERT_TRUE(client.initialize(kServiceIdentity));
-        char clientId = 1; // as it is encoded
-        client.send(new PTC::Event(kPlayerAdapterId, static_cast<long>(PlayerMethod::play),
-                                   &clientId, sizeof clientId, true, false));
-        EXPECT_EQ(played.wait_for(std::chrono::seconds(30)), std::future_status::ready);
-        EXPECT_FALSE(isDeleted);
+        std::promise<void> done;
+        EXPECT_CALL(*discoverer, getMetadata(1));
+        EXPECT_CALL(*importer, cancel(2));
+        EXPECT_CALL(*player, play(3)).WillOnce([&done] { done.set_value(); });
+        Client client;
+        client.request(kDiscovererAdapterId, DiscovererMethod::getMetadata, 1);
+        client.request(kImporterAdapterId, ImporterMethod::cancel, 2);
+        client.request(kPlayerAdapterId, PlayerMethod::play, 3);
+        EXPECT_EQ(done.get_future().wait_for(std::chrono::seconds(30)), std::future_status::ready);
+        EXPECT_TRUE(Mock::VerifyAndClearExpectations(player)) << "alive up to here";
+        EXPECT_CALL(*discoverer, died());
+        EXPECT_CALL(*importer, died());
+        EXPECT_CALL(*player, died());
     }
-    EXPECT_TRUE(isDeleted);
 }
 
-TEST(RegisteredService, IsItsOwnersUntilTheFactoryIsInitialised) {
-    bool isDeleted = false;
-    PlayerDouble player(isDeleted);
-    { MediaServiceFactory().RegisterObject(kPlayerAdapterId, asService(&player)); }
-    EXPECT_FALSE(isDeleted);
+TEST(RegisteredServices, AreTheirOwnersUntilTheFactoryIsInitialised) {
+    StrictMock<PlayerMock> player;
+    {
+        MediaServiceFactory().RegisterObject(kPlayerAdapterId,
+                                             static_cast<IMediaPlayerService*>(&player));
+    }
+    EXPECT_CALL(player, died());
 }
 
 } // namespace
