@@ -5,6 +5,7 @@
 
 #include "cli/HumanTime.h"
 #include "cli/MediaPath.h"
+#include "cli/MediaTime.h"
 #include "cli/StateName.h"
 
 using namespace std::chrono_literals;
@@ -28,6 +29,26 @@ TEST(HumanTime, TellsNegativeTimesAndTheLongest) {
     EXPECT_EQ(humanTime(-5s), "-0:05.0");
     EXPECT_EQ(humanTime(qnsmedia::Nanoseconds::max()), "2562047:47:16.8");
     EXPECT_EQ(humanTime(-qnsmedia::Nanoseconds::max()), "-2562047:47:16.8");
+}
+
+TEST(MediaTime, IsSecondsMinutesAndHours) {
+    EXPECT_EQ(parseMediaTime("90")->time, 90s);
+    EXPECT_EQ(parseMediaTime("1:23.5")->time, 83500ms);
+    EXPECT_EQ(parseMediaTime("1:02:03")->time, 1h + 2min + 3s);
+    EXPECT_EQ(parseMediaTime("100:00")->time, 100min);
+}
+
+TEST(MediaTime, CanBeAPartOfTheWhole) {
+    EXPECT_EQ(parseMediaTime("25%")->in(8s), 2s);
+    EXPECT_EQ(parseMediaTime("0%")->in(8s), 0s);
+    EXPECT_EQ(parseMediaTime("100%")->in(8s), 8s);
+    EXPECT_EQ(parseMediaTime("3")->in(8s), 3s);
+}
+
+TEST(MediaTime, IsNothingElse) {
+    for (const char* text : {"", "x", ":", "1:", ":1", "1:60", "1:2:3:4", "-1", "1 ", " 1", "1e3",
+                             "%", "101%", "inf", "nan", "99999999999"})
+        EXPECT_FALSE(parseMediaTime(text)) << text;
 }
 
 TEST(MediaPath, BeginsAtTheRoot) {
