@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
-// Shows what a client can do: every step of playing a file through the daemon, in plain words.
-// usage: qnsmedia-tour FILE
+// Shows what a client can do: every step of describing and playing a file through the daemon, in
+// plain words.
+// usage: qnsmedia-tour FILE [FOLDER]    with FOLDER: writes a picture of the file there
 #include <algorithm>
 #include <condition_variable>
 #include <cstdio>
@@ -11,7 +12,9 @@
 #include <unistd.h>
 
 #include "cli/HumanTime.h"
+#include "cli/InfoText.h"
 #include "cli/MediaPath.h"
+#include "qnsmedia/Discoverer.h"
 #include "qnsmedia/Error.h"
 #include "qnsmedia/Player.h"
 
@@ -93,13 +96,16 @@ void require(bool happened, const char* what) {
 
 class Tour {
 public:
-    explicit Tour(const std::string& file) : mPath(mediaPath(file)), mPlayer(mConnection) {
+    Tour(const std::string& file, const std::string& folder)
+        : mPath(mediaPath(file)), mFolder(folder), mPlayer(mConnection) {
         mPlayer.onNotification([this](const auto& notification) { mEvents.add(notification); });
     }
 
     void run();
 
 private:
+    void discover();
+    void drawPicture(qnsmedia::Discoverer& discoverer, Nanoseconds position);
     void open();
     void play();
     void showPositions(int count);
@@ -112,6 +118,7 @@ private:
     [[nodiscard]] Nanoseconds position() { return mPlayer.status().get().position; }
 
     const std::string mPath;
+    const std::string mFolder;
     Events mEvents;
     qnsmedia::MediaInfo mMedia;
     qnsmedia::Connection mConnection;
@@ -121,6 +128,7 @@ private:
 void Tour::run() {
     std::printf("Registered as identity %d, client id %d\n", mConnection.identity(),
                 mPlayer.clientId());
+    discover();
     open();
     play();
     if (mMedia.duration == 0s) {
@@ -136,6 +144,30 @@ void Tour::run() {
         showEnd();
     }
     closeAndPowerOff();
+}
+
+/** What cannot be described may be playable all the same: a stream from the network, say. */
+void Tour::discover() {
+    qnsmedia::Discoverer discoverer(mConnection);
+    try {
+        discoverer.open(mPath).get();
+        const qnsmedia::Metadata metadata = discoverer.metadata().get();
+        std::printf("Described %s\n%s", mPath.c_str(), infoText(metadata).c_str());
+        if (!mFolder.empty())
+            drawPicture(discoverer, metadata.duration / 2);
+    } catch (const qnsmedia::MediaError& error) {
+        std::printf("Not described: %s\n", error.what());
+    }
+}
+
+void Tour::drawPicture(qnsmedia::Discoverer& discoverer, Nanoseconds position) {
+    const std::string picture = mediaPath(mFolder + "/picture.jpg");
+    try {
+        discoverer.makeImage(position, 320, 0, picture).get();
+        std::printf("Drew %s, as it is at %s\n", picture.c_str(), humanTime(position).c_str());
+    } catch (const qnsmedia::MediaError& error) {
+        std::printf("No picture: %s\n", error.what());
+    }
 }
 
 void Tour::open() {
@@ -231,12 +263,12 @@ void Tour::closeAndPowerOff() {
 } // namespace
 
 int main(int argc, char** argv) {
-    if (argc != 2) {
-        std::fputs("usage: qnsmedia-tour FILE\n", stderr);
+    if (argc < 2 || argc > 3) {
+        std::fputs("usage: qnsmedia-tour FILE [FOLDER]\n", stderr);
         return 2;
     }
     try {
-        Tour(argv[1]).run();
+        Tour(argv[1], argc > 2 ? argv[2] : "").run();
         return 0;
     } catch (const std::exception& error) {
         std::fflush(stdout);

@@ -1,4 +1,7 @@
 // SPDX-License-Identifier: MIT
+#include <filesystem>
+#include <unistd.h>
+
 #include "tests/cli/support/ToolTest.h"
 
 using testing::HasSubstr;
@@ -19,12 +22,26 @@ protected:
 TEST_F(Examples, TheTourTellsEveryStepOfAFilm) {
     const std::string told = tour(sample::filmWithUnicodeName());
     std::size_t at = 0;
-    for (const char* step :
-         {"Registered as identity 1000, client id 1", "Opened ", "1 video, 1 audio, 0 text",
-          "duration: 0:10.0; seekable", "Playing\n", "  at 0:00.", "Paused at ", "Playing again",
-          "Sought to 0:05.0", "Looping from 0:05.0 to 0:06.0", "returned to the start (1)",
-          "returned to the start (2)", "Loop ended", "Sought to 0:08.5", "End of the file",
-          "Closed", "Power-off accepted"}) {
+    for (const char* step : {"Registered as identity 1000, client id 1",
+                             "Described ",
+                             "video/mp4",
+                             "H.264",
+                             "Opened ",
+                             "1 video, 1 audio, 0 text",
+                             "duration: 0:10.0; seekable",
+                             "Playing\n",
+                             "  at 0:00.",
+                             "Paused at ",
+                             "Playing again",
+                             "Sought to 0:05.0",
+                             "Looping from 0:05.0 to 0:06.0",
+                             "returned to the start (1)",
+                             "returned to the start (2)",
+                             "Loop ended",
+                             "Sought to 0:08.5",
+                             "End of the file",
+                             "Closed",
+                             "Power-off accepted"}) {
         const std::size_t found = told.find(step, at);
         ASSERT_NE(found, std::string::npos) << step << " is not in\n" << told.substr(at);
         at = found;
@@ -38,6 +55,16 @@ TEST_F(Examples, TheTourLeavesOutWhatAShortSoundCannotDo) {
 TEST_F(Examples, TheTourLeavesOutWhatAPictureCannotDo) {
     EXPECT_THAT(tour(QNS_SOURCE_DIR "/share/mediaplayer/images/black.jpg"),
                 HasSubstr("Without a duration"));
+}
+
+TEST_F(Examples, TheTourDrawsAPictureWhereItMay) {
+    const std::string folder = testing::TempDir() + "/qns-tour-" + std::to_string(::getpid());
+    std::filesystem::create_directory(folder);
+    Tool tool(QNS_TOUR, {sample::shortSound(), folder}, Tool::Output::pipe);
+    EXPECT_EQ(tool.waitForExit(), 0) << tool.errors();
+    EXPECT_THAT(tool.output(), HasSubstr("No picture: image: not available"));
+    EXPECT_EQ(mpDaemon->waitForExit(), 0);
+    std::filesystem::remove_all(folder);
 }
 
 TEST_F(Examples, TheTourSaysWhatCannotBePlayed) {
