@@ -13,6 +13,7 @@ struct Options {
     std::string dataFolder; ///< absolute; empty when it is not known
     Probe probe;
     std::chrono::milliseconds progressInterval{200}; ///< at least so long between two
+    std::chrono::microseconds notifyGap{300};        ///< at least so long between any two
 };
 
 /** The device's data directory; empty when it is not known. */
