@@ -43,8 +43,8 @@ const char* meaningOf(int result) {
     }
 }
 
-std::string folderOf(const std::string& path) {
-    return path.substr(0, path.rfind('/'));
+Failure cancelled(const Job& job) {
+    return {kCancelled, "Cancelled: " + engine::toBytes(job.text)};
 }
 
 } // namespace
@@ -63,6 +63,7 @@ void Batch::fail(Item& item, int result, const std::string& message) {
     item.result = result;
     item.message = message;
     item.staged.reset();
+    item.unwritten.reset();
 }
 
 template<typename Step>
@@ -91,16 +92,18 @@ void Batch::add(Job job) {
 }
 
 void Batch::prepare(Item& item) {
-    const Source source(item.job.text);
+    Source source(item.job.text);
     item.record = describe(source);
     library::Database& database = mCatalogue.database();
     if (!item.job.folder.empty()) {
         Folder folder = mCatalogue.folder().enter(engine::toBytes(item.job.folder));
-        if (folder.path != source.folder())
+        if (folder.path != folderOf(source.path()))
             return prepareCopy(item, source, std::move(folder));
     }
     // A copy that is imported again where it lies still is a copy of what it was.
     item.record.source = database.sourceOf(source.path()).value_or(source.path());
+    if (source.mayBeUnwritten())
+        item.unwritten = std::move(source);
 }
 
 library::MediaRecord Batch::describe(const Source& source) const {
@@ -145,7 +148,7 @@ void Batch::stage(Item& item, const Source& source) {
 
 void Batch::showProgress(const Item& item, std::int64_t bytes) {
     if (mQueue.isCancelled(item.job))
-        throw Failure(kCancelled, "Cancelled");
+        throw cancelled(item.job);
     mQueue.setProgress(mBytes + bytes);
     const auto now = std::chrono::steady_clock::now();
     if (now - mShown < mOptions.progressInterval)
@@ -171,21 +174,39 @@ void Batch::finish() {
 void Batch::dropCancelled() {
     for (Item& item : mItems) {
         if (mQueue.isCancelled(item.job))
-            fail(item, kCancelled, "Cancelled");
+            fail(item, kCancelled, cancelled(item.job).what());
     }
 }
 
 void Batch::complete() {
     if (std::none_of(mItems.begin(), mItems.end(), [](const Item& item) { return item.isAlive(); }))
         return;
-    forEachCopy([this](Item& item) {
-        item.staged->finish(item.record.modified);
-        chooseName(item);
-    });
+    syncContents();
+    forEachCopy([this](Item& item) { chooseName(item); });
     announceCopies();
     publishCopies();
     syncTargets();
     writeRows();
+}
+
+void Batch::syncContents() {
+    forEachCopy([](Item& item) { item.staged->setModified(item.record.modified); });
+    std::vector<int> files;
+    for (const Item& item : mItems) {
+        if (item.staged || item.unwritten)
+            files.push_back(item.staged ? item.staged->file() : item.unwritten->file());
+    }
+    const SyncedDevices synced = syncShared(files);
+    forEachCopy([&](Item& item) { syncFile(item.staged->file(), item.record.path, synced); });
+    for (Item& item : mItems) {
+        if (item.unwritten)
+            attempt(item, [&] { syncUnwritten(*item.unwritten, synced); });
+    }
+}
+
+void Batch::syncUnwritten(const Source& source, const SyncedDevices& synced) {
+    syncFile(source.file(), source.path(), synced);
+    syncEntry(source.file(), source.path(), synced);
 }
 
 template<typename Step>

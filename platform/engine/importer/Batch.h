@@ -13,6 +13,7 @@
 #include "importer/Options.h"
 #include "importer/Outlet.h"
 #include "importer/Source.h"
+#include "importer/Syncs.h"
 #include "library/MediaRecord.h"
 
 namespace importer {
@@ -54,6 +55,7 @@ private:
         std::string message;                ///< when result is not 0
         library::MediaRecord record;        ///< when result is 0
         std::unique_ptr<StagedFile> staged; ///< the copy, if it is one
+        std::optional<Source> unwritten; ///< the file itself, if it is catalogued and may need it
         Target target;
         bool announced = false; ///< the database knows that the copy is to get its name
         bool published = false; ///< the copy has its name
@@ -76,6 +78,8 @@ private:
 
     void dropCancelled();
     void complete();
+    void syncContents();
+    static void syncUnwritten(const Source& source, const SyncedDevices& synced);
     void chooseName(Item& item) const;
     [[nodiscard]] bool isTaken(const Target& target, const std::string& name) const;
     void announceCopies();

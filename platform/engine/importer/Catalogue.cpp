@@ -20,10 +20,6 @@ using namespace LibMediaPlayer;
 
 namespace {
 
-std::string folderOf(const std::string& path) {
-    return path.substr(0, path.rfind('/'));
-}
-
 void removeDurably(const std::string& path) {
     ::unlink(path.c_str());
     const std::string folder = folderOf(path);
@@ -45,7 +41,21 @@ bool Catalogue::exists() const {
     return !mDataFolder.empty() && ::access(mDatabasePath.c_str(), F_OK) == 0;
 }
 
+void Catalogue::start() {
+    if (!exists())
+        return;
+    try {
+        database();
+    } catch (const Failure& failure) {
+        // Everything else will fail the same way for the first use.
+        if (failure.result() == kDamaged)
+            mUntold = failure;
+    }
+}
+
 library::Database& Catalogue::database() {
+    if (const auto untold = std::exchange(mUntold, std::nullopt))
+        throw *untold;
     if (mDatabase && !mDatabase->isInPlace())
         close();
     if (!mDatabase) {

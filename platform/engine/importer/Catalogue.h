@@ -22,8 +22,8 @@ class Catalogue {
 public:
     Catalogue(std::string dataFolder, Probe probe);
 
-    /** True when there is something to take up from an earlier run. */
-    [[nodiscard]] bool exists() const;
+    /** Puts right at once what an earlier run left; what fails is told by the first use. */
+    void start();
 
     /** The database, after what an interrupted run left has been put right. Throws Failure. */
     library::Database& database();
@@ -38,6 +38,7 @@ public:
     Failure giveUp(const library::Error& error);
 
 private:
+    [[nodiscard]] bool exists() const;
     void lock();
     void open();
     void close();
@@ -53,6 +54,7 @@ private:
     qns::UniqueFd mLock; ///< the database's folder; locked while open
     std::optional<library::Database> mDatabase;
     std::optional<LibraryFolder> mFolder;
+    std::optional<Failure> mUntold; ///< the database was set aside, and nobody has heard of it
     bool mSwept = false;
 };
 

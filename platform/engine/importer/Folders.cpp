@@ -15,18 +15,18 @@ namespace {
 
 constexpr char kMaking[] = "The folder cannot be made";
 
-std::string parentOf(const std::string& path) {
+} // namespace
+
+std::string folderOf(const std::string& path) {
     const std::size_t slash = path.rfind('/');
     return slash == 0 ? "/" : path.substr(0, slash);
 }
-
-} // namespace
 
 void makeFolders(const std::string& path) {
     struct stat status {};
     if (path.empty() || (::stat(path.c_str(), &status) == 0 && S_ISDIR(status.st_mode)))
         return;
-    const std::string parent = parentOf(path);
+    const std::string parent = folderOf(path);
     if (parent != path)
         makeFolders(parent);
     if (::mkdir(path.c_str(), 0777) != 0 && errno != EEXIST)

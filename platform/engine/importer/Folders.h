@@ -5,6 +5,9 @@
 
 namespace importer {
 
+/** The folder that an absolute path lies in. */
+std::string folderOf(const std::string& path);
+
 /** Makes the folder, and those above it, so that they survive a power cut. Throws Failure. */
 void makeFolders(const std::string& path);
 

@@ -28,6 +28,7 @@ std::int64_t sizeOf(const std::wstring& text) {
 
 Importer::Importer(Options options)
     : mOptions(std::move(options)),
+      mOutlet(mOptions.notifyGap),
       mCatalogue(mOptions.dataFolder, mOptions.probe),
       mThread([this] { run(); }) {}
 
@@ -62,10 +63,7 @@ int Importer::dumpGraph(const std::wstring& path) {
 }
 
 void Importer::run() {
-    // What an earlier run left half done is put right at once; a failure is told to the next
-    // import, which tries again.
-    if (mCatalogue.exists())
-        handle::guarded([this] { mCatalogue.database(); });
+    handle::guarded([this] { mCatalogue.start(); });
     while (!mQueue.isClosed()) {
         if (auto job = mQueue.take())
             handle::guarded([&] { runBatch(*std::move(job)); });

@@ -93,13 +93,11 @@ StagedFile::~StagedFile() {
         ::unlinkat(mStaging.fd(), mName.c_str(), 0);
 }
 
-void StagedFile::finish(std::int64_t modified) {
+void StagedFile::setModified(std::int64_t modified) {
     constexpr std::int64_t kSecond = 1'000'000'000;
     const std::int64_t seconds = modified / kSecond - (modified % kSecond < 0 ? 1 : 0);
     const timespec times[2] = {{0, UTIME_OMIT}, {seconds, modified - seconds * kSecond}};
     ::futimens(mFile.get(), times);
-    if (::fsync(mFile.get()) != 0)
-        throw systemFailure(kWriting, mStaging.path + "/" + mName);
 }
 
 void StagedFile::publish(const Folder& folder, const std::string& name, bool replace) {

@@ -30,8 +30,8 @@ public:
     [[nodiscard]] int file() const { return mFile.get(); }
     [[nodiscard]] ino_t inode() const { return mInode; }
 
-    /** Sets the time of last modification, nanoseconds since 1970, and syncs the content. */
-    void finish(std::int64_t modified);
+    /** Sets the time of last modification, nanoseconds since 1970. */
+    void setModified(std::int64_t modified);
 
     /** Gives the file its final name, taking another file's place only if asked to. */
     void publish(const Folder& folder, const std::string& name, bool replace);

@@ -2,6 +2,7 @@
 #include "importer/Source.h"
 
 #include <cstdlib>
+#include <ctime>
 #include <fcntl.h>
 #include <memory>
 
@@ -65,8 +66,9 @@ Source::Source(const std::wstring& text) {
     requireRegular(mStatus, path);
 }
 
-std::string Source::folder() const {
-    return mPath.substr(0, mPath.rfind('/'));
+bool Source::mayBeUnwritten() const {
+    constexpr std::time_t kLongestInMemory = 300;
+    return std::time(nullptr) < mStatus.st_ctim.tv_sec + kLongestInMemory;
 }
 
 void Source::checkUnchanged() const {

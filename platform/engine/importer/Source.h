@@ -24,10 +24,12 @@ public:
     [[nodiscard]] int file() const { return mFile.get(); }
     [[nodiscard]] const std::string& name() const { return mName; } ///< as the client calls it
     [[nodiscard]] const std::string& path() const { return mPath; } ///< without links
-    [[nodiscard]] std::string folder() const;
     [[nodiscard]] std::int64_t size() const { return mStatus.st_size; }
     [[nodiscard]] std::int64_t modified() const { return modifiedTime(mStatus); }
     [[nodiscard]] const struct stat& status() const { return mStatus; }
+
+    /** True when the file was changed so lately that it may not be on its disk yet. */
+    [[nodiscard]] bool mayBeUnwritten() const;
 
     /** Throws Failure when the file has changed since it was opened. */
     void checkUnchanged() const;
