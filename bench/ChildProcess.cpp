@@ -32,6 +32,10 @@ ChildProcess ChildProcess::run(const std::vector<std::string>& command, int outp
     });
 }
 
+void ChildProcess::waitForEnd() {
+    ::waitpid(std::exchange(mPid, -1), nullptr, 0);
+}
+
 ChildProcess::~ChildProcess() {
     if (mPid <= 0)
         return;

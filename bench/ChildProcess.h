@@ -27,6 +27,9 @@ public:
 
     [[nodiscard]] pid_t pid() const { return mPid; }
 
+    /** Until it ends by itself. */
+    void waitForEnd();
+
 private:
     explicit ChildProcess(pid_t pid) : mPid(pid) {}
 

@@ -16,6 +16,7 @@ struct Bench {
 };
 
 constexpr Bench kBenches[] = {
+    {"media", "read and draw files, beside the libraries and commands that do", bench::runMedia},
     {"pack", "encode and decode every value form, beside msgpack-c", bench::runPack},
     {"player", "open, seek, close and loop real files, beside libmpv", bench::runPlayer},
     {"rpc", "one request and its answer, beside bare sockets and D-Bus", bench::runRpc},

@@ -61,6 +61,31 @@ bool isPlayable(const AVStream& stream) {
     return isVideo(stream) || isAudio(stream);
 }
 
+/** Of the longest stream, in AV_TIME_BASE; 0 when one of them does not say. */
+std::int64_t durationOfStreams(const AVFormatContext& context) {
+    std::int64_t longest = 0;
+    for (unsigned int index = 0; index < context.nb_streams; ++index) {
+        const AVStream& stream = *context.streams[index];
+        if (!isPlayable(stream))
+            continue;
+        if (stream.duration <= 0)
+            return 0;
+        longest =
+            std::max(longest, av_rescale_q(stream.duration, stream.time_base, {1, AV_TIME_BASE}));
+    }
+    return longest;
+}
+
+/** Formats whose header tells everything of sound, but not of the whole file. */
+bool tellsOfSound(const AVFormatContext& context) {
+    constexpr std::string_view kFormats[] = {"aiff", "au", "mp3", "ogg"};
+    const std::string_view format = context.iformat->name;
+    const AVStream* const* const streams = context.streams;
+    return std::find(std::begin(kFormats), std::end(kFormats), format) != std::end(kFormats) &&
+           std::none_of(streams, streams + context.nb_streams,
+                        [](const AVStream* stream) { return isVideo(*stream); });
+}
+
 } // namespace
 
 MediaFile::MediaFile(qns::UniqueFd file, std::int64_t size, Bounds bounds)
@@ -117,6 +142,8 @@ int MediaFile::openInput() {
     context->probesize = 1024 * 1024;
     const int error = avformat_open_input(&context, nullptr, mpFormat, nullptr);
     mContext = FormatContext(kAdopt, context);
+    if (error >= 0 && mContext->duration <= 0 && tellsOfSound(*mContext.get()))
+        mContext->duration = durationOfStreams(*mContext.get());
     return error;
 }
 
