@@ -10,7 +10,7 @@
 
 #include <gmock/gmock.h>
 
-#include "tests/discoverer/TestFolder.h"
+#include "tests/support/TestFolder.h"
 
 namespace {
 

@@ -19,9 +19,9 @@
 #include "ptc/Event.h"
 #include "ptc/IFactory.h"
 #include "tests/discoverer/EngineMock.h"
-#include "tests/discoverer/TestFolder.h"
 #include "tests/support/PlatformDouble.h"
 #include "tests/support/RecordingSender.h"
+#include "tests/support/TestFolder.h"
 
 /** Numbers of the requests, as they stand in packets. */
 enum RequestId : long {

@@ -1,44 +1,29 @@
 // SPDX-License-Identifier: MIT
 #include "tests/daemon/support/DiscovererClient.h"
 
-#include <gtest/gtest.h>
+using wire::Bytes;
 
-#include "tests/daemon/support/PlayerClient.h"
-
-using wire::Packet;
-
-wire::Bytes discoverer::imageResult(std::int32_t result, std::int32_t code, std::string_view file,
-                                    std::string_view image) {
+Bytes discoverer::image(std::int32_t result, std::int32_t code, std::string_view file,
+                        std::string_view image) {
     return wire::int32(result) + wire::int32(code) + wire::text(file) + wire::text(image);
 }
 
-wire::Bytes discoverer::noStreams() {
-    return wire::raw("") + wire::int32(0) + wire::int32(0);
+Bytes discoverer::extensions(std::string_view list, std::int32_t count) {
+    return wire::text(list) + wire::int32(0) + wire::int32(count);
 }
 
-std::int32_t DiscovererClient::registerCallBack(long object) {
-    if (!mConnected)
-        connect();
-    mConnected = true;
-    request(discoverer::kRegister, wire::integer(object) + wire::integer(identity()));
-    const auto reply = receive();
-    if (!reply) {
-        ADD_FAILURE() << "No answer to the registration of " << identity();
-        return -1;
-    }
-    const auto id = wire::readInt32(reply->payload);
-    EXPECT_EQ(*reply, (Packet{receiverOf(identity()), object, discoverer::kClientIdCallBack, true,
-                              true, wire::int32(id)}));
-    return id;
+Bytes discoverer::streams(const Bytes& packed, std::int32_t count) {
+    return wire::raw(packed) + wire::int32(static_cast<std::int32_t>(packed.size())) +
+           wire::int32(count);
 }
 
-void DiscovererClient::request(long method, const wire::Bytes& arguments) {
-    send(Packet{8, 51, method, false, true, arguments});
+Bytes discoverer::newMetadata(std::int32_t result, std::int32_t code) {
+    return wire::int32(result) + wire::int32(code) + wire::text("") + wire::text("") +
+           wire::integer(0) + wire::integer(0) + wire::int64(0) + streams("", 0) + streams("", 0);
 }
 
-void DiscovererClient::request(long method, std::int32_t client) {
-    request(method, wire::integer(client));
-}
+DiscovererClient::DiscovererClient(long identity)
+    : ServiceClient(identity, {51, discoverer::kRegister, discoverer::kUnregister}) {}
 
 void DiscovererClient::open(std::int32_t client, std::string_view file) {
     request(discoverer::kOpen, wire::integer(client) + wire::text(file));
@@ -50,20 +35,4 @@ void DiscovererClient::getImage(std::int32_t client, std::string_view image,
     request(discoverer::kGetImage, wire::integer(client) + wire::integer(width) +
                                        wire::integer(height) + wire::integer(position) +
                                        wire::text(image) + wire::text(notice));
-}
-
-void DiscovererClient::expectCallBack(long object, long method, const wire::Bytes& arguments) {
-    EXPECT_EQ(receive(), (Packet{receiverOf(identity()), object, method, true, true, arguments}));
-}
-
-void DiscovererClient::expectResult(long object, long method, std::int32_t result) {
-    expectCallBack(object, method, wire::int32(result));
-}
-
-void DiscovererClient::expectNothingElse() {
-    request(discoverer::kRegister, wire::integer(kMarkerObject) + wire::integer(identity()));
-    const auto reply = receive();
-    ASSERT_TRUE(reply) << "No answer to " << identity();
-    EXPECT_EQ(reply->object, kMarkerObject) << testing::PrintToString(*reply);
-    request(discoverer::kUnregister, wire::readInt32(reply->payload));
 }

@@ -1,8 +1,9 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <cstddef>
 #include <set>
+#include <string>
+#include <vector>
 
 #include "tests/daemon/support/DaemonTest.h"
 #include "tests/daemon/support/DiscovererClient.h"
@@ -10,14 +11,24 @@
 /** A daemon whose discoverers report every call to the test and block until they are told. */
 class DiscovererDaemonTest : public DaemonTest {
 protected:
+    /** Starts the daemon and registers a client. */
     void SetUp() override;
 
     /** Starts the daemon; the engine does not make the discoverers with these numbers. */
-    void startDiscoverers(const std::set<int>& refused = {},
-                          DaemonOptions options = withEngineDouble());
+    void startDiscoverers(const std::set<int>& refused = {});
 
-    /** One for each client that can be served, and the importer's. */
-    static constexpr int kDiscoverers = 11;
+    /** Opens a file for the client of SetUp(). */
+    void open(const std::string& file);
+
+    /** All that the service has written to the system log, without what all lines begin with. */
+    void expectServiceLog(const std::vector<std::string>& events);
+
+    /** The controller has written this line. */
+    void expectEngineFailure(const std::string& event);
+
+    static constexpr long kObject = 100;
 
     EngineScript mDiscoverers;
+    DiscovererClient mClient{1000};
+    std::int32_t mId = -1; ///< the client of SetUp(), whose discoverer has the number 0
 };

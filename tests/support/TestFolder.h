@@ -13,7 +13,7 @@
 class TestFolder {
 public:
     TestFolder() {
-        std::string path = std::filesystem::temp_directory_path() / "discoverer-test-XXXXXX";
+        std::string path = std::filesystem::temp_directory_path() / "qns-test-XXXXXX";
         if (!::mkdtemp(path.data()))
             throw std::runtime_error("cannot make " + path);
         mPath = path;
