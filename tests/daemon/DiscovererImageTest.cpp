@@ -15,10 +15,10 @@ namespace {
 
 constexpr std::int64_t kDuration = 1000;
 
-class DiscovererImage : public DiscovererDaemonTest {
+class DiscovererImage : public DiscovererClientTest {
 protected:
     void SetUp() override {
-        DiscovererDaemonTest::SetUp();
+        DiscovererClientTest::SetUp();
         if (!HasFatalFailure())
             open("/a.mp4");
     }

@@ -13,7 +13,7 @@ using wire::Bytes;
 
 namespace {
 
-class DiscovererRequest : public DiscovererDaemonTest {
+class DiscovererRequest : public DiscovererClientTest {
 protected:
     std::vector<std::string> trace() { return mpDaemon->output().with("MediaDiscoverer"); }
 
@@ -260,6 +260,16 @@ TEST_F(DiscovererRequest, ARequestWithoutArgumentsIsThatOfAnUnknownClient) {
         mClient.request(method, Bytes());
     mClient.expectNothingElse();
     expectExtensions();
+}
+
+TEST_F(DiscovererRequest, MissingArgumentsHaveTheValuesOfANewRecord) {
+    mClient.request(kOpen, mId);
+    mDiscoverers.expectCall("discoverer 0 open \"\"", "return 1");
+    mClient.expectResult(kObject, kOpenCallBack, 1);
+    mClient.request(kGetImage, mId);
+    mDiscoverers.expectCall("discoverer 0 metadata");
+    mDiscoverers.expectCall("discoverer 0 makeImage 0 0 0 \"\"");
+    mClient.expectCallBack(kObject, kImageCallBack, image(0, 0, "", ""));
 }
 
 TEST_F(DiscovererRequest, AnyClientMayActForAnother) {

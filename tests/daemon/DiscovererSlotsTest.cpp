@@ -11,7 +11,7 @@ namespace {
 constexpr int kSlots = 10;
 
 /** Clients beside that of SetUp(), which has the first slot. */
-class DiscovererSlots : public DiscovererDaemonTest {
+class DiscovererSlots : public DiscovererClientTest {
 protected:
     struct Client {
         std::int32_t id;

@@ -15,8 +15,7 @@ constexpr const char* kError = "<131>";
 } // namespace
 
 void DiscovererDaemonTest::SetUp() {
-    ASSERT_NO_FATAL_FAILURE(startDiscoverers());
-    mId = mClient.registerCallBack(kObject);
+    startDiscoverers();
 }
 
 void DiscovererDaemonTest::startDiscoverers(const std::set<int>& refused) {
@@ -29,14 +28,19 @@ void DiscovererDaemonTest::startDiscoverers(const std::set<int>& refused) {
     ASSERT_TRUE(mpDaemon->waitUntilServing()) << mpDaemon->output().joined();
 }
 
-void DiscovererDaemonTest::open(const std::string& file) {
+void DiscovererClientTest::SetUp() {
+    ASSERT_NO_FATAL_FAILURE(startDiscoverers());
+    mId = mClient.registerCallBack(kObject);
+}
+
+void DiscovererClientTest::open(const std::string& file) {
     mClient.open(mId, file);
     mDiscoverers.expectCall("discoverer 0 open " +
                             script::quoted(std::wstring(file.begin(), file.end())));
     mClient.expectResult(kObject, discoverer::kOpenCallBack, 0);
 }
 
-void DiscovererDaemonTest::expectServiceLog(const std::vector<std::string>& events) {
+void DiscovererClientTest::expectServiceLog(const std::vector<std::string>& events) {
     EXPECT_TRUE(mSyslog.waitForLine(kServiceName, events.size()));
     std::vector<std::string> lines;
     for (const auto& event : events)
@@ -45,7 +49,7 @@ void DiscovererDaemonTest::expectServiceLog(const std::vector<std::string>& even
     EXPECT_THAT(mSyslog.lines(kServiceName), testing::Each(testing::StartsWith(kInformation)));
 }
 
-void DiscovererDaemonTest::expectEngineFailure(const std::string& event) {
+void DiscovererClientTest::expectEngineFailure(const std::string& event) {
     const std::string line = "MediaDiscovererController 410: " + event;
     EXPECT_TRUE(mSyslog.waitForLine(line));
     EXPECT_THAT(mSyslog.messages(line), testing::ElementsAre(line));

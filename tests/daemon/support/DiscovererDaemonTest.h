@@ -11,13 +11,21 @@
 /** A daemon whose discoverers report every call to the test and block until they are told. */
 class DiscovererDaemonTest : public DaemonTest {
 protected:
-    /** Starts the daemon and registers a client. */
+    /** Starts the daemon. */
     void SetUp() override;
 
     /** Starts the daemon; the engine does not make the discoverers with these numbers. */
     void startDiscoverers(const std::set<int>& refused = {});
 
-    /** Opens a file for the client of SetUp(). */
+    EngineScript mDiscoverers;
+};
+
+/** The same with a client, which has the first discoverer. */
+class DiscovererClientTest : public DiscovererDaemonTest {
+protected:
+    void SetUp() override;
+
+    /** Opens a file for the client. */
     void open(const std::string& file);
 
     /** All that the service has written to the system log, without what all lines begin with. */
@@ -28,7 +36,6 @@ protected:
 
     static constexpr long kObject = 100;
 
-    EngineScript mDiscoverers;
     DiscovererClient mClient{1000};
-    std::int32_t mId = -1; ///< the client of SetUp(), whose discoverer has the number 0
+    std::int32_t mId = -1;
 };
