@@ -61,9 +61,10 @@ int draw(const Picture& picture, const Layout& layout, Canvas& canvas) {
         return kInternal;
     const bool shines = hasAlpha(picture.frame->format);
     canvas.size = layout.canvas;
-    canvas.pixels.assign(static_cast<std::size_t>(layout.canvas.width) *
-                             static_cast<std::size_t>(layout.canvas.height),
-                         kBlack);
+    const std::size_t count = static_cast<std::size_t>(layout.canvas.width) *
+                              static_cast<std::size_t>(layout.canvas.height);
+    canvas.pixels.reserve(count + kReadAhead);
+    canvas.pixels.assign(count, kBlack);
     const std::uint32_t* next = pixels.data();
     for (int y = 0; y < decoded.height; ++y) {
         for (int x = 0; x < decoded.width; ++x, ++next) {

@@ -9,7 +9,7 @@
 
 namespace discoverer {
 
-/** Rows of opaque pixels 0xAARRGGBB. */
+/** Rows of opaque pixels 0xAARRGGBB. They have reserved room for kReadAhead more. */
 struct Canvas {
     Size size;
     std::vector<std::uint32_t> pixels;

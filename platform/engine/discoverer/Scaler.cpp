@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: MIT
 #include "discoverer/Scaler.h"
 
+#include <algorithm>
+
 extern "C" {
 #include <libswscale/swscale.h>
 }
@@ -45,6 +47,22 @@ void setColours(const Scaler& scaler, int matrix, bool fromFull, bool toFull) {
                              kNeutral);
 }
 
+/** The library writes in steps: rows run over by less than so many pixels. */
+constexpr std::size_t kSlack = 64;
+
+std::size_t paddedWidth(Size size) {
+    return (static_cast<std::size_t>(size.width) / kSlack + 2) * kSlack;
+}
+
+/** Rows of `padded` pixels become rows of the width. */
+void removePadding(std::vector<std::uint32_t>& pixels, std::size_t padded, Size size) {
+    const auto width = static_cast<std::size_t>(size.width);
+    for (std::size_t row = 1; row < static_cast<std::size_t>(size.height); ++row)
+        std::copy_n(pixels.begin() + static_cast<std::ptrdiff_t>(row * padded), width,
+                    pixels.begin() + static_cast<std::ptrdiff_t>(row * width));
+    pixels.resize(width * static_cast<std::size_t>(size.height));
+}
+
 } // namespace
 
 bool scaleToPixels(const AVFrame& frame, Size size, std::vector<std::uint32_t>& pixels) {
@@ -53,13 +71,16 @@ bool scaleToPixels(const AVFrame& frame, Size size, std::vector<std::uint32_t>& 
     if (!scaler)
         return false;
     setColours(scaler, matrixOf(frame), frame.color_range == AVCOL_RANGE_JPEG, true);
-    const auto width = static_cast<std::size_t>(size.width);
-    pixels.resize(width * static_cast<std::size_t>(size.height));
+    const std::size_t padded = paddedWidth(size);
+    pixels.resize(padded * static_cast<std::size_t>(size.height));
     std::uint8_t* const planes[] = {reinterpret_cast<std::uint8_t*>(pixels.data()), nullptr,
                                     nullptr, nullptr};
-    const int strides[] = {size.width * 4, 0, 0, 0};
-    return sws_scale(scaler.get(), frame.data, frame.linesize, 0, frame.height, planes, strides) ==
-           size.height;
+    const int strides[] = {static_cast<int>(padded) * 4, 0, 0, 0};
+    if (sws_scale(scaler.get(), frame.data, frame.linesize, 0, frame.height, planes, strides) !=
+        size.height)
+        return false;
+    removePadding(pixels, padded, size);
+    return true;
 }
 
 bool convertFromPixels(const std::vector<std::uint32_t>& pixels, Size size, AVPixelFormat format,
