@@ -5,6 +5,7 @@
 #include <utility>
 
 #include "discoverer/Discoverer.h"
+#include "discoverer/Thumbnail.h"
 #include "handle/Barrier.h"
 #include "importer/Importer.h"
 #include "importer/LookProbe.h"
@@ -28,6 +29,7 @@ IMediaImporter* InterfaceFactory::createImporter() {
         importer::Options options;
         options.dataFolder = importer::dataFolder();
         options.probe = importer::probeByLook;
+        options.drawThumbnail = discoverer::drawThumbnail;
         return std::make_unique<importer::Importer>(std::move(options)).release();
     });
 }

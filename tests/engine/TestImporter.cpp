@@ -81,10 +81,13 @@ std::wstring wide(const fs::path& path) {
     return engine::toWide(path.string());
 }
 
-TestImporter::TestImporter(const fs::path& data, importer::Probe probe, Handler onNotify) {
+TestImporter::TestImporter(const fs::path& data, importer::Probe probe, Handler onNotify,
+                           importer::DrawThumbnail drawThumbnail) {
     importer::Options options;
     options.dataFolder = data.string();
     options.probe = std::move(probe);
+    options.drawThumbnail = std::move(drawThumbnail);
+    options.drawingHaste = importer::Haste::kNormal;
     options.progressInterval = std::chrono::milliseconds(0);
     mpImporter = std::make_unique<importer::Importer>(std::move(options));
     mpImporter->setNotify([this, onNotify = std::move(onNotify)](Notification& notification) {

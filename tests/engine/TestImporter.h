@@ -52,7 +52,7 @@ public:
 
     /** `onNotify` runs on the importer's thread, before the notification is recorded. */
     TestImporter(const std::filesystem::path& data, importer::Probe probe,
-                 Handler onNotify = nullptr);
+                 Handler onNotify = nullptr, importer::DrawThumbnail drawThumbnail = nullptr);
     ~TestImporter();
     TestImporter(const TestImporter&) = delete;
     TestImporter& operator=(const TestImporter&) = delete;

@@ -67,11 +67,15 @@ int rotationOf(const AVStream& stream, const AVFrame& frame) {
 /** Decodes one stream of a file up to a moment. */
 class FrameFinder {
 public:
-    FrameFinder(probe::MediaFile& file, AVStream& stream) : mFile(file), mStream(stream) {}
+    FrameFinder(probe::MediaFile& file, AVStream& stream, int budget)
+        : mFile(file), mStream(stream), mBudget(budget) {}
 
     int run(std::chrono::nanoseconds position, Picture& picture);
+    /** The picture that came with the header: the rest of the file is not read for it. */
+    int runOnCover(Picture& picture);
 
 private:
+    int take(Picture& picture);
     [[nodiscard]] bool openDecoder();
     [[nodiscard]] std::int64_t beginning() const;
     void search(std::int64_t from);
@@ -93,7 +97,7 @@ private:
     probe::Frame mBest = probe::makeFrame();  ///< the last one not after the target
     probe::Frame mLater = probe::makeFrame(); ///< the first one after it
     std::int64_t mTarget = 0;                 ///< in the stream's time base
-    int mBudget = kFrameBudget;
+    int mBudget;
     bool mPassed = false; ///< nothing that comes can be better
 };
 
@@ -107,6 +111,18 @@ int FrameFinder::run(std::chrono::nanoseconds position, Picture& picture) {
         if (mBest->buf[0] || isDone())
             break;
     }
+    return take(picture);
+}
+
+int FrameFinder::runOnCover(Picture& picture) {
+    if (!openDecoder())
+        return kNotMedia;
+    decode(mStream.attached_pic);
+    drain();
+    return take(picture);
+}
+
+int FrameFinder::take(Picture& picture) {
     probe::Frame& found = mBest->buf[0] ? mBest : mLater;
     if (!found->buf[0])
         return mFile.isExhausted() ? kTimedOut : kDamaged;
@@ -148,14 +164,14 @@ void FrameFinder::search(std::int64_t from) {
         if (!begun)
             continue;
         decode(*mPacket.get());
-        if (isShownAtTarget(*mPacket.get()))
+        if (isShownAtTarget(*mPacket.get()) || mBudget <= 0)
             return drain();
     }
 }
 
 void FrameFinder::seekTo(std::int64_t from) {
     avcodec_flush_buffers(mCodec.get());
-    if (mFile.isPicture() || probe::isCover(mStream))
+    if (mFile.isPicture())
         return;
     av_seek_frame(&mFile.context(), mStream.index, from, AVSEEK_FLAG_BACKWARD);
 }
@@ -214,13 +230,19 @@ bool FrameFinder::isShownAtTarget(const AVPacket& packet) const {
 
 } // namespace
 
-int findPicture(probe::MediaFile& file, std::chrono::nanoseconds position, Picture& picture) {
-    AVStream* stream = findStream(file.context(), probe::isVideo);
+int findPicture(probe::MediaFile& file, std::chrono::nanoseconds position, Picture& picture,
+                int frameBudget) {
+    AVStream* const stream = findStream(file.context(), probe::isVideo);
     if (!stream)
-        stream = findStream(file.context(), probe::isCover);
+        return findCover(file, picture);
+    return FrameFinder(file, *stream, frameBudget).run(position, picture);
+}
+
+int findCover(probe::MediaFile& file, Picture& picture) {
+    AVStream* const stream = findStream(file.context(), probe::isCover);
     if (!stream)
         return kNotAvailable;
-    return FrameFinder(file, *stream).run(position, picture);
+    return FrameFinder(file, *stream, kFrameBudget).runOnCover(picture);
 }
 
 } // namespace discoverer

@@ -23,8 +23,13 @@ inline constexpr int kFrameBudget = 500;
 /**
  * The picture that is shown at `position` from the file's beginning: the frame that begins there
  * or last before. Where key frames lie further apart than kFrameBudget, the nearest one reached.
- * Of a file without video, its cover. Returns 0 or a LibMediaPlayer::Result.
+ * Of a file without video, its cover. With a smaller budget, a picture at or soon after the last
+ * key frame before `position`. Returns 0 or a LibMediaPlayer::Result.
  */
-int findPicture(probe::MediaFile& file, std::chrono::nanoseconds position, Picture& picture);
+int findPicture(probe::MediaFile& file, std::chrono::nanoseconds position, Picture& picture,
+                int frameBudget = kFrameBudget);
+
+/** The picture that stands for the whole file. kNotAvailable when there is none. */
+int findCover(probe::MediaFile& file, Picture& picture);
 
 } // namespace discoverer

@@ -12,25 +12,13 @@
 
 #include "LibMediaPlayer/Result.h"
 #include "base/UniqueFd.h"
-#include "discoverer/Scaler.h"
+#include "discoverer/ImageEncoder.h"
 
 namespace discoverer {
 
 using namespace LibMediaPlayer;
-using probe::kAdopt;
 
 namespace {
-
-struct Encoding {
-    AVCodecID codec;
-    AVPixelFormat format;
-};
-
-constexpr Encoding kPng{AV_CODEC_ID_PNG, AV_PIX_FMT_RGB24};
-constexpr Encoding kJpeg{AV_CODEC_ID_MJPEG, AV_PIX_FMT_YUVJ444P};
-
-/** From 2, the best, to 31. */
-constexpr int kJpegQuality = 3;
 
 bool endsWith(const std::string& path, std::string_view ending) {
     const auto isSame = [](char one, char other) {
@@ -57,28 +45,6 @@ int resultOfErrno(int error) {
     default:
         return kNotAvailable;
     }
-}
-
-bool encode(const Canvas& canvas, Encoding encoding, AVPacket& packet) {
-    const probe::Frame frame = probe::makeFrame();
-    if (!convertFromPixels(canvas.pixels, canvas.size, encoding.format, *frame.get()))
-        return false;
-    const AVCodec* const encoder = avcodec_find_encoder(encoding.codec);
-    const probe::CodecContext codec(kAdopt, avcodec_alloc_context3(encoder));
-    if (!encoder || !codec)
-        return false;
-    codec->width = canvas.size.width;
-    codec->height = canvas.size.height;
-    codec->pix_fmt = encoding.format;
-    codec->color_range = AVCOL_RANGE_JPEG;
-    codec->time_base = {1, 1};
-    codec->thread_count = 1;
-    codec->flags |= AV_CODEC_FLAG_QSCALE;
-    codec->global_quality = kJpegQuality * FF_QP2LAMBDA;
-    frame->quality = codec->global_quality;
-    return avcodec_open2(codec.get(), encoder, nullptr) >= 0 &&
-           avcodec_send_frame(codec.get(), frame.get()) >= 0 &&
-           avcodec_receive_packet(codec.get(), &packet) >= 0;
 }
 
 /** A file that has another name until it is whole. */
@@ -147,9 +113,9 @@ int writeWhole(const std::string& path, const void* data, std::size_t size) {
     return file.finish();
 }
 
-int writeEncoded(const Canvas& canvas, Encoding encoding, const std::string& path) {
-    const probe::Packet packet = probe::makePacket();
-    if (!encode(canvas, encoding, *packet.get()))
+int writeEncoded(const Canvas& canvas, const Encoding& encoding, const std::string& path) {
+    const probe::Packet packet = encode(canvas, encoding);
+    if (!packet)
         return kInternal;
     return writeWhole(path, packet->data, static_cast<std::size_t>(packet->size));
 }

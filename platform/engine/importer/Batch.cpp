@@ -110,8 +110,8 @@ library::MediaRecord Batch::describe(const Source& source) const {
     Probed probed = mOptions.probe(source.path());
     if (probed.result != kOk)
         throw Failure(probed.result, meaningOf(probed.result) + (": " + source.path()));
-    return {source.path(),     source.path(),      source.size(),
-            source.modified(), std::time(nullptr), std::move(probed.info)};
+    return {source.path(),      source.path(),          source.size(),    source.modified(),
+            std::time(nullptr), std::move(probed.info), probed.hasPicture};
 }
 
 /** A file that was copied into that folder before keeps the name that it has there. */

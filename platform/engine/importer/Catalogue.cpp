@@ -42,14 +42,21 @@ bool Catalogue::exists() const {
 }
 
 void Catalogue::start() {
-    if (!exists())
-        return;
-    try {
-        database();
-    } catch (const Failure& failure) {
-        // Everything else will fail the same way for the first use.
+    if (exists())
+        useQuietly([this] { database(); });
+}
+
+void Catalogue::useQuietly(const std::function<void()>& use) {
+    const auto keepUntold = [this](const Failure& failure) {
         if (failure.result() == kDamaged)
             mUntold = failure;
+    };
+    try {
+        use();
+    } catch (const library::Error& error) {
+        keepUntold(giveUp(error));
+    } catch (const Failure& failure) {
+        keepUntold(failure);
     }
 }
 
@@ -162,7 +169,7 @@ void Catalogue::recover(const library::PendingCopy& copy) {
     const Probed probed = mProbe(copy.path);
     if (probed.result == kOk)
         mDatabase->put({copy.path, *source, status.st_size, modifiedTime(status),
-                        status.st_ctim.tv_sec, probed.info});
+                        status.st_ctim.tv_sec, probed.info, probed.hasPicture});
 }
 
 } // namespace importer

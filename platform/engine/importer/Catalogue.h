@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <functional>
 #include <memory>
 #include <optional>
 #include <string>
@@ -25,11 +26,20 @@ public:
     /** Puts right at once what an earlier run left; what fails is told by the first use. */
     void start();
 
+    /** True when the database has been begun; no other use should begin it than an import. */
+    [[nodiscard]] bool exists() const;
+
     /** The database, after what an interrupted run left has been put right. Throws Failure. */
     library::Database& database();
 
     /** Throws Failure. */
     LibraryFolder& folder();
+
+    /**
+     * Runs what nobody waits for. That the database had to be set aside is told by the next use;
+     * any other failure meets that itself.
+     */
+    void useQuietly(const std::function<void()>& use);
 
     /**
      * Closes the database after an operation of it has failed, sets it aside when it is damaged,
@@ -38,7 +48,6 @@ public:
     Failure giveUp(const library::Error& error);
 
 private:
-    [[nodiscard]] bool exists() const;
     void lock();
     void open();
     void close();

@@ -21,6 +21,7 @@ constexpr char kFormat[] = R"(digraph importer {
   batch [label="batch\n%s\n%lld of %lld bytes"];
   queue -> batch -> probe -> copy -> sync -> "database\nmedia.db" -> notify;
   probe -> sync [label="catalogued where it lies"];
+  "database\nmedia.db" -> thumbnails [dir=both, label="drawn while the machine is idle"];
 }
 )";
 

@@ -30,6 +30,7 @@ Importer::Importer(Options options)
     : mOptions(std::move(options)),
       mOutlet(mOptions.notifyGap),
       mCatalogue(mOptions.dataFolder, mOptions.probe),
+      mThumbnails(mOptions, mQueue, mCatalogue),
       mThread([this] { run(); }) {}
 
 Importer::~Importer() {
@@ -65,11 +66,13 @@ int Importer::dumpGraph(const std::wstring& path) {
 void Importer::run() {
     handle::guarded([this] { mCatalogue.start(); });
     while (!mQueue.isClosed()) {
+        handle::guarded([this] { mThumbnails.tend(); });
         if (auto job = mQueue.take())
             handle::guarded([&] { runBatch(*std::move(job)); });
         else
             mQueue.wait();
     }
+    handle::guarded([this] { mThumbnails.stop(); });
 }
 
 void Importer::runBatch(Job first) {

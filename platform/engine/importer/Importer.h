@@ -10,6 +10,7 @@
 #include "importer/JobQueue.h"
 #include "importer/Options.h"
 #include "importer/Outlet.h"
+#include "importer/Thumbnails.h"
 
 namespace importer {
 
@@ -33,8 +34,9 @@ private:
     const Options mOptions;
     JobQueue mQueue;
     Outlet mOutlet;
-    Catalogue mCatalogue; ///< only the thread's
-    std::thread mThread;  ///< last, for it uses the others
+    Catalogue mCatalogue;   ///< only the thread's
+    Thumbnails mThumbnails; ///< only the thread's
+    std::thread mThread;    ///< last, for it uses the others
 };
 
 } // namespace importer

@@ -41,6 +41,14 @@ void JobQueue::close() {
     mChanged.notify_one();
 }
 
+void JobQueue::wake() {
+    {
+        const std::lock_guard lock(mMutex);
+        mWoken = true;
+    }
+    mChanged.notify_one();
+}
+
 ImporterState JobQueue::status(MediaImporterStatus& status) const {
     const std::lock_guard lock(mMutex);
     status.done = std::min(mBytesAnswered + mBytesUnderWay, mBytesInAll);
@@ -70,7 +78,8 @@ std::optional<Job> JobQueue::takeIf(const std::function<bool(const Job&)>& suits
 
 void JobQueue::wait() {
     std::unique_lock lock(mMutex);
-    mChanged.wait(lock, [this] { return mClosed || !mWaiting.empty(); });
+    mChanged.wait(lock, [this] { return mClosed || mWoken || !mWaiting.empty(); });
+    mWoken = false;
 }
 
 bool JobQueue::isClosed() const {

@@ -39,11 +39,14 @@ public:
     LibMediaPlayer::ImporterState status(LibMediaPlayer::MediaImporterStatus& status) const;
     [[nodiscard]] std::size_t waitingCount() const;
 
+    /** The worker has something else to do. */
+    void wake();
+
     /** The worker's side. */
     std::optional<Job> take();
     /** The next job when there is one and it suits. */
     std::optional<Job> takeIf(const std::function<bool(const Job&)>& suits);
-    /** Until there is a job to take or the queue is closed. */
+    /** Until there is a job to take, somebody has called wake(), or the queue is closed. */
     void wait();
     [[nodiscard]] bool isClosed() const;
     [[nodiscard]] bool isCancelled(const Job& job) const;
@@ -60,6 +63,7 @@ private:
     std::uint64_t mAnswered = 0;      ///< jobs up to this one have their answer
     std::uint64_t mCancelledUpTo = 0; ///< jobs up to this one are to be cancelled
     bool mClosed = false;
+    bool mWoken = false;
     std::int64_t mBytesAnswered = 0;
     std::int64_t mBytesUnderWay = 0;
     std::int64_t mBytesInAll = 0;

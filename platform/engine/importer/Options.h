@@ -5,6 +5,7 @@
 #include <string>
 
 #include "importer/Probe.h"
+#include "importer/ThumbnailThread.h"
 
 namespace importer {
 
@@ -12,6 +13,8 @@ namespace importer {
 struct Options {
     std::string dataFolder; ///< absolute; empty when it is not known
     Probe probe;
+    DrawThumbnail drawThumbnail; ///< empty: nobody wants any
+    Haste drawingHaste = Haste::kWhenIdle;
     std::chrono::milliseconds progressInterval{200}; ///< at least so long between two
     std::chrono::microseconds notifyGap{300};        ///< at least so long between any two
 };

@@ -12,6 +12,7 @@ namespace importer {
 struct Probed {
     int result = 0; ///< a LibMediaPlayer::Result; the details count only when it is 0
     LibMediaPlayer::MediaMetaInfo info;
+    bool hasPicture = true; ///< a cover or a film: a thumbnail can be drawn
 };
 
 /** Reads a file's details, in a bounded time whatever the file. Called by the worker's thread. */

@@ -19,7 +19,8 @@ namespace {
 /** Long enough for a reader's checkpoint, short enough to be told about. */
 constexpr int kBusyMilliseconds = 2000;
 
-constexpr int kThumbnailTries = 2;
+/** A process that ends while it draws costs one too. */
+constexpr int kThumbnailTries = 3;
 
 enum Query : std::size_t {
     kPutMedia,
@@ -74,12 +75,14 @@ constexpr std::array<const char*, kQueryCount> kQueries = {
     // kPendingCopies
     "SELECT path, inode FROM copying",
     // kMissingThumbnails
-    "SELECT id, path, thumbnail_tries FROM media WHERE thumbnail_tries > 0"
-    " ORDER BY thumbnail_tries DESC LIMIT ?1",
+    "SELECT id, path, size, modified, thumbnail_tries FROM media WHERE thumbnail_tries > 0"
+    " ORDER BY thumbnail_tries DESC, id DESC LIMIT ?1",
     // kSetThumbnailTries
-    "UPDATE media SET thumbnail_tries = ?2 WHERE id = ?1",
+    "UPDATE media SET thumbnail_tries = ?5"
+    " WHERE id = ?1 AND path = ?2 AND size = ?3 AND modified = ?4",
     // kPutThumbnail
-    "INSERT OR REPLACE INTO thumbnail SELECT id, ?2 FROM media WHERE id = ?1"};
+    "INSERT OR REPLACE INTO thumbnail SELECT id, ?5 FROM media"
+    " WHERE id = ?1 AND path = ?2 AND size = ?3 AND modified = ?4"};
 
 void bindAll(SQLite::Statement&, int) {}
 
@@ -125,8 +128,9 @@ private:
     SQLite::Statement& mStatement;
 };
 
-Database::Transaction::Transaction(Database& database)
+Database::Transaction::Transaction(Database& database, Durability durability)
     : mFile(database.mFile), mTransaction(checked(mFile, [&] {
+          database.setDurability(durability);
           return SQLite::Transaction(database.mDatabase, SQLite::TransactionBehavior::IMMEDIATE);
       })) {}
 
@@ -152,6 +156,15 @@ Database::Database(const std::string& file)
     ::stat(mFile.c_str(), &status);
     mDevice = status.st_dev;
     mInode = status.st_ino;
+}
+
+/** Cannot be changed inside a transaction, and need not be when it is the same as before. */
+void Database::setDurability(Durability durability) {
+    if (durability == mDurability)
+        return;
+    mDatabase.exec(durability == Durability::kKept ? "PRAGMA synchronous = FULL"
+                                                   : "PRAGMA synchronous = NORMAL");
+    mDurability = durability;
 }
 
 void Database::migrate() {
@@ -202,7 +215,7 @@ std::int64_t Database::putMedia(const MediaRecord& record, const std::vector<Tag
     Use row(*this, kPutMedia, record.path, record.source, record.size, record.modified,
             record.imported, system.mediaType, system.duration, system.seekable ? 1 : 0,
             firstValue(tags, "TITLE"), firstValue(tags, "ARTIST"), firstValue(tags, "ALBUM"),
-            kThumbnailTries);
+            record.hasPicture ? kThumbnailTries : 0);
     row.next();
     const std::int64_t id = row.number(0);
     row.run();
@@ -281,21 +294,27 @@ std::vector<MissingThumbnail> Database::missingThumbnails(int limit) {
         std::vector<MissingThumbnail> missing;
         Use row(*this, kMissingThumbnails, limit);
         while (row.next())
-            missing.push_back({row.number(0), row.text(1), static_cast<int>(row.number(2))});
+            missing.push_back({row.number(0), row.text(1), row.number(2), row.number(3),
+                               static_cast<int>(row.number(4))});
         return missing;
     });
 }
 
-void Database::setThumbnailTries(std::int64_t id, int tries) {
-    checked(mFile, [&] { Use(*this, kSetThumbnailTries, id, tries).run(); });
+void Database::setThumbnailTries(const MissingThumbnail& missing, int tries) {
+    checked(mFile, [&] {
+        Use(*this, kSetThumbnailTries, missing.id, missing.path, missing.size, missing.modified,
+            tries)
+            .run();
+    });
 }
 
-void Database::putThumbnail(std::int64_t id, const std::string& jpeg) {
+void Database::putThumbnail(const MissingThumbnail& missing, const std::string& jpeg) {
     checked(mFile, [&] {
-        Use row(*this, kPutThumbnail, id);
-        row.bindBlob(2, jpeg);
+        Use row(*this, kPutThumbnail, missing.id, missing.path, missing.size, missing.modified);
+        row.bindBlob(5, jpeg);
         row.run();
     });
+    setThumbnailTries(missing, 0);
 }
 
 } // namespace library

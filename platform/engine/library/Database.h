@@ -27,15 +27,18 @@ struct PendingCopy {
     ino_t inode = 0;
 };
 
-/** A medium that has no thumbnail yet. */
+/** A medium that has no thumbnail yet, and the content that it is to be drawn from. */
 struct MissingThumbnail {
     std::int64_t id = 0;
     std::string path;
+    std::int64_t size = 0;
+    std::int64_t modified = 0;
     int tries = 0; ///< how often it may still be tried
 };
 
 /**
- * The media library's database. A committed transaction survives a power cut.
+ * The media library's database. Writes survive a power cut once their transaction
+ * is committed, unless it says otherwise.
  *
  * For one thread; other programs may read and write the file at the same time. Every operation
  * throws Error.
@@ -47,10 +50,16 @@ public:
     Database(const Database&) = delete;
     Database& operator=(const Database&) = delete;
 
+    /** What becomes of a commit when the power fails at once. */
+    enum class Durability {
+        kKept,   ///< it survives
+        kUnsure, ///< it may be undone; the next kept one makes it survive. Takes no time
+    };
+
     /** All writes happen inside one. Rolled back unless committed. */
     class Transaction {
     public:
-        explicit Transaction(Database& database);
+        explicit Transaction(Database& database, Durability durability = Durability::kKept);
         void commit();
 
     private:
@@ -76,14 +85,17 @@ public:
     void endCopy(const std::string& path);
     std::vector<PendingCopy> pendingCopies();
 
-    /** Those with more tries left come first. */
+    /** Those with more tries left come first, then those that were added last. */
     std::vector<MissingThumbnail> missingThumbnails(int limit);
-    void setThumbnailTries(std::int64_t id, int tries);
-    void putThumbnail(std::int64_t id, const std::string& jpeg);
+
+    /** The next two do nothing when the medium is another one by now, or has changed. */
+    void setThumbnailTries(const MissingThumbnail& missing, int tries);
+    void putThumbnail(const MissingThumbnail& missing, const std::string& jpeg);
 
 private:
     class Use;
 
+    void setDurability(Durability durability);
     void migrate();
     void prepare();
     void putStreams(std::int64_t id, const LibMediaPlayer::MediaMetaInfo& info);
@@ -95,6 +107,7 @@ private:
     const std::string mFile;
     SQLite::Database mDatabase;
     std::vector<SQLite::Statement> mStatements; ///< after the database, so that they go first
+    Durability mDurability = Durability::kKept;
     dev_t mDevice = 0;
     ino_t mInode = 0;
 };

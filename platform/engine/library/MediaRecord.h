@@ -16,6 +16,7 @@ struct MediaRecord {
     std::int64_t modified = 0; ///< nanoseconds since 1970
     std::int64_t imported = 0; ///< seconds since 1970
     LibMediaPlayer::MediaMetaInfo info;
+    bool hasPicture = true; ///< it has something that a thumbnail could show
 };
 
 } // namespace library
