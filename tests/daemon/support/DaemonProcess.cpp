@@ -67,7 +67,7 @@ StringList environmentFor(const DaemonOptions& options) {
 StringList commandFor(const DaemonOptions& options) {
     StringList command{"setpriv", "--pdeathsig", "KILL"};
     command.insert(command.end(), options.privileges.begin(), options.privileges.end());
-    command.insert(command.end(), {"--", QNS_DAEMON});
+    command.insert(command.end(), {"--", options.program});
     command.insert(command.end(), options.arguments.begin(), options.arguments.end());
     return command;
 }

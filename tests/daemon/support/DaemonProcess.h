@@ -18,6 +18,8 @@
 
 /** How a daemon is started. */
 struct DaemonOptions {
+    std::string program = QNS_DAEMON;
+
     /** Where standard output goes. Standard error goes with it, but not into the full pipe. */
     enum class Output { captured, closed, fullPipe };
 

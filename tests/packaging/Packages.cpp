@@ -1,0 +1,68 @@
+// SPDX-License-Identifier: MIT
+#include "tests/packaging/Packages.h"
+
+#include <array>
+#include <cstdio>
+#include <sstream>
+#include <sys/wait.h>
+
+Outcome run(const std::string& command) {
+    std::FILE* pipe = ::popen(('(' + command + ") 2>&1").c_str(), "r");
+    if (pipe == nullptr)
+        return {};
+    Outcome outcome;
+    std::array<char, 4096> block{};
+    while (const std::size_t size = std::fread(block.data(), 1, block.size(), pipe))
+        outcome.output.append(block.data(), size);
+    const int status = ::pclose(pipe);
+    outcome.status = WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status);
+    return outcome;
+}
+
+std::string outputOf(const std::string& command) {
+    const Outcome outcome = run(command);
+    EXPECT_EQ(outcome.status, 0) << command << '\n' << outcome.output;
+    return outcome.output;
+}
+
+std::vector<std::string> linesOf(const std::string& text) {
+    std::vector<std::string> lines;
+    std::istringstream stream(text);
+    for (std::string line; std::getline(stream, line);)
+        lines.push_back(line);
+    return lines;
+}
+
+namespace packages {
+
+namespace {
+
+std::string all() {
+    std::string list;
+    for (const std::string& name : names())
+        list += ' ' + name;
+    return list;
+}
+
+} // namespace
+
+const std::vector<std::string>& names() {
+    static const std::vector<std::string> kNames = {"libqnsys1",       "libmediaplayer-proxy1",
+                                                    "qnsmediaservice", "libqnsmediaclient1",
+                                                    "qnsmedia",        "libqnsmedia-dev"};
+    return kNames;
+}
+
+void install() {
+    outputOf("dpkg --install " QNS_PACKAGE_FOLDER "/*.deb");
+}
+
+void remove() {
+    outputOf("dpkg --remove" + all());
+}
+
+void purge() {
+    outputOf("dpkg --purge" + all());
+}
+
+} // namespace packages
