@@ -7,11 +7,11 @@
 
 #include "LibMediaPlayer/Result.h"
 #include "discoverer/Canvas.h"
-#include "discoverer/Description.h"
 #include "discoverer/Extensions.h"
 #include "discoverer/FrameFinder.h"
 #include "discoverer/ImageFile.h"
 #include "discoverer/Layout.h"
+#include "discoverer/OpenMedia.h"
 #include "handle/Barrier.h"
 #include "player/Medium.h"
 #include "text/Text.h"
@@ -25,24 +25,6 @@ namespace {
 
 /** Decoding takes longer than looking; still an answer comes within five seconds. */
 constexpr MediaFile::Bounds kImageBounds{256 * 1024 * 1024, std::chrono::milliseconds(3500)};
-
-bool canDecode(const AVFormatContext& context) {
-    return std::any_of(context.streams, context.streams + context.nb_streams,
-                       [](const AVStream* stream) {
-                           return (probe::isVideo(*stream) || probe::isAudio(*stream)) &&
-                                  avcodec_find_decoder(stream->codecpar->codec_id);
-                       });
-}
-
-int openFile(const std::string& path, MediaFile::Bounds bounds, std::unique_ptr<MediaFile>& pFile) {
-    auto opened = MediaFile::open(path, bounds);
-    if (const auto* const failure = std::get_if<probe::LookFailure>(&opened))
-        return failure->result;
-    if (std::holds_alternative<probe::LookUndecided>(opened))
-        return kTimedOut;
-    pFile = std::move(std::get<std::unique_ptr<MediaFile>>(opened));
-    return canDecode(pFile->context()) ? kOk : kNotMedia;
-}
 
 int drawImage(MediaFile& file, std::chrono::nanoseconds position, Size asked,
               const std::string& path) {
@@ -69,31 +51,25 @@ int Discoverer::open(const std::wstring& path) {
         const engine::Medium medium = engine::toMedium(path);
         if (medium.path.empty())
             return static_cast<int>(medium.uri.empty() ? kNotFound : kNotAvailable);
-        const int result = openFile(medium.path, MediaFile::kLook, mpFile);
+        const int result = mFile.open(medium.path);
         if (result == kOk)
             mPath = medium.path;
-        else
-            mpFile.reset();
         return result;
     });
 }
 
 int Discoverer::close() {
     mPath.clear();
-    mpFile.reset();
-    mInfo.reset();
+    mFile.close();
     return kOk;
 }
 
 int Discoverer::metadata(MediaMetaInfo& info) {
     return handle::guarded(static_cast<int>(kInternal), [&] {
-        if (mpFile) {
-            mInfo = describe(*mpFile);
-            mpFile.reset();
-        }
-        if (!mInfo)
+        const auto details = mFile.describe();
+        if (!details)
             return static_cast<int>(kWrongState);
-        info = *mInfo;
+        info = details->info;
         return static_cast<int>(kOk);
     });
 }
@@ -109,7 +85,7 @@ int Discoverer::makeImage(int64_t position, int32_t width, int32_t height,
         if (mPath.empty() || !layOut({1, 1}, width, height))
             return static_cast<int>(kWrongState);
         std::unique_ptr<MediaFile> pFile;
-        if (const int result = openFile(mPath, kImageBounds, pFile); result != kOk)
+        if (const int result = openMedia(mPath, kImageBounds, pFile); result != kOk)
             return result;
         const std::chrono::nanoseconds from(std::max<int64_t>(position, 0));
         return drawImage(*pFile, from, {width, height}, engine::toBytes(path));

@@ -1,12 +1,10 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <memory>
-#include <optional>
 #include <string>
 
 #include "LibMediaPlayer/IMediaDiscoverer.h"
-#include "probe/MediaFile.h"
+#include "discoverer/DescribedFile.h"
 
 namespace discoverer {
 
@@ -24,8 +22,7 @@ public:
 
 private:
     std::string mPath;
-    std::unique_ptr<probe::MediaFile> mpFile; ///< from open() to the first metadata()
-    std::optional<LibMediaPlayer::MediaMetaInfo> mInfo;
+    DescribedFile mFile;
 };
 
 } // namespace discoverer

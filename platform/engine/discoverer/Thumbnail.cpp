@@ -5,13 +5,13 @@
 #include <array>
 #include <chrono>
 #include <memory>
-#include <variant>
 
 #include "LibMediaPlayer/Result.h"
 #include "discoverer/Canvas.h"
 #include "discoverer/FrameFinder.h"
 #include "discoverer/ImageEncoder.h"
 #include "discoverer/Layout.h"
+#include "discoverer/OpenMedia.h"
 
 namespace discoverer {
 
@@ -95,20 +95,12 @@ int drawBrightScene(MediaFile& file, Canvas& brightest) {
     return result;
 }
 
-std::unique_ptr<MediaFile> openFile(const std::string& path, int& result) {
-    auto opened = MediaFile::open(path, kBounds);
-    if (auto* const pFile = std::get_if<std::unique_ptr<MediaFile>>(&opened))
-        return std::move(*pFile);
-    const auto* const failure = std::get_if<probe::LookFailure>(&opened);
-    result = failure ? failure->result : kTimedOut;
-    return nullptr;
-}
-
 } // namespace
 
 Thumbnail drawThumbnail(const std::string& path) {
     Thumbnail thumbnail;
-    const auto pFile = openFile(path, thumbnail.result);
+    std::unique_ptr<MediaFile> pFile;
+    thumbnail.result = openMedia(path, kBounds, pFile);
     if (!pFile)
         return thumbnail;
     Canvas canvas;

@@ -5,7 +5,7 @@
 
 namespace importer {
 
-/** The details that a short look at a file tells. */
+/** The details that a short look at a file tells; a discoverer may have had it lately. */
 Probed probeByLook(const std::string& path);
 
 } // namespace importer

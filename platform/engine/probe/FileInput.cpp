@@ -27,6 +27,13 @@ bool FileInput::isExhausted() const {
     return mBytesLeft <= 0 || std::chrono::steady_clock::now() >= mDeadline;
 }
 
+struct stat FileInput::status() const {
+    struct stat status {};
+    if (::fstat(mFile.get(), &status) != 0)
+        status = {};
+    return status;
+}
+
 int FileInput::readBytes(void* input, std::uint8_t* buffer, int size) {
     return static_cast<FileInput*>(input)->read(buffer, size);
 }

@@ -4,6 +4,7 @@
 #include <chrono>
 #include <cstdint>
 #include <string>
+#include <sys/stat.h>
 
 #include "base/UniqueFd.h"
 #include "probe/AvTypes.h"
@@ -23,6 +24,7 @@ public:
 
     [[nodiscard]] AVIOContext* context() const { return mContext.get(); }
     [[nodiscard]] std::int64_t size() const { return mSize; } ///< bytes
+    [[nodiscard]] struct stat status() const;                 ///< all zero when it fails
     [[nodiscard]] bool isExhausted() const;
 
 private:

@@ -48,6 +48,9 @@ public:
 
     [[nodiscard]] std::int64_t size() const { return mInput.size(); } ///< bytes
 
+    /** As the file system has it now. */
+    [[nodiscard]] struct stat status() const { return mInput.status(); }
+
     /** One picture, without time. */
     [[nodiscard]] bool isPicture() const;
 
