@@ -17,47 +17,69 @@ namespace {
 
 constexpr const char* kUnit = "/usr/lib/systemd/system/QNSMediaService.service";
 
-/** The values of a setting of the unit, word by word. */
-std::vector<std::string> setting(const std::string& name) {
-    return linesOf(outputOf("sed --quiet 's/^" + name + "=//p' " + kUnit + " | tr ' ' '\\n'"));
-}
+constexpr const char* kConfine = "/usr/local/bin/confine";
 
-/** The daemon as the unit starts it: command, environment, user, capability. */
-DaemonOptions asService() {
-    DaemonOptions options;
-    options.arguments = setting("ExecStart");
-    options.program = options.arguments.front();
-    options.arguments.erase(options.arguments.begin());
-    for (const std::string& variable : setting("Environment")) {
-        const std::size_t equals = variable.find('=');
-        options.environment[variable.substr(0, equals)] = variable.substr(equals + 1);
-    }
-    options.environment["HOME"] = "/var/lib/qnsmedia";
-    options.privileges = {"--reuid",       setting("User").front(),
-                          "--regid",       setting("Group").front(),
-                          "--init-groups", "--no-new-privs"};
-    for (const char* set : {"--inh-caps", "--ambient-caps", "--bounding-set"})
-        options.privileges.insert(options.privileges.end(), {set, "-all,+net_bind_service"});
-    return options;
-}
-
+/** The installed daemon with all that its unit allows it and no more. */
 class Service : public Installed {
 protected:
-    /** Makes the folders that systemd makes for it. */
     void SetUp() override {
-        for (const char* folder : {"/var/lib/qnsmedia", "/var/cache/qnsmedia", "/run/qnsmedia"})
-            outputOf(std::string("install -d -o qnsmedia -g qnsmedia -m 0750 ") + folder);
-        std::filesystem::copy_file(sample::shortSound(), "/srv/sound.wav",
-                                   std::filesystem::copy_options::overwrite_existing);
+        // Where the daemon's user can reach it.
+        outputOf(std::string("install -m 755 " QNS_CONFINE " ") + kConfine);
+        outputOf("install -m 644 " + sample::film() + " /srv/film.mp4");
+        DaemonOptions options;
+        options.program = QNS_AS_UNIT;
+        options.arguments = {kUnit, kConfine};
+        mpDaemon = std::make_unique<DaemonProcess>(options);
+        ASSERT_TRUE(mpDaemon->waitUntilServing()) << mpDaemon->output().joined();
+        EXPECT_THAT(mpDaemon->output().with("[Error]"), IsEmpty());
+    }
+    void TearDown() override { EXPECT_EQ(mpDaemon->terminate(), 0); }
+
+    std::unique_ptr<DaemonProcess> mpDaemon;
+};
+
+TEST_F(Service, HasOneCapabilityAndNoWayToMore) {
+    const std::string status = outputOf("cat /proc/" + std::to_string(mpDaemon->pid()) + "/status");
+    constexpr const char* kBindService = "0000000000000400\n";
+    for (const char* set : {"CapPrm:\t", "CapEff:\t", "CapBnd:\t", "CapAmb:\t"})
+        EXPECT_THAT(status, HasSubstr(std::string(set) + kBindService));
+    EXPECT_THAT(status, HasSubstr("NoNewPrivs:\t1\n"));
+    EXPECT_THAT(status, HasSubstr("Seccomp:\t2\n"));
+}
+
+TEST_F(Service, Plays) {
+    EXPECT_THAT(outputOf("qnsmedia play /srv/film.mp4"), HasSubstr("1 video, 1 audio"));
+}
+
+TEST_F(Service, DrawsPicturesIntoItsFolderForItsGroup) {
+    outputOf("qnsmedia image /srv/film.mp4 -o /run/qnsmedia/film.jpg");
+    EXPECT_EQ(outputOf("stat --format='%U %G %a' /run/qnsmedia/film.jpg"),
+              "qnsmedia qnsmedia 640\n");
+}
+
+TEST_F(Service, WritesNowhereElse) {
+    outputOf("install -d -m 777 /srv/all");
+    EXPECT_NE(run("qnsmedia image /srv/film.mp4 -o /srv/all/film.jpg").status, 0);
+    EXPECT_FALSE(std::filesystem::exists("/srv/all/film.jpg"));
+}
+
+TEST_F(Service, RemembersGStreamersPlugins) {
+    EXPECT_THAT(outputOf("ls /var/cache/qnsmedia/gstreamer-1.0"), HasSubstr("registry"));
+}
+
+/** The means of these tests forbid what they should. */
+class Confinement : public Installed {
+protected:
+    static Outcome confined(const std::string& command) {
+        return run(std::string(QNS_CONFINE " ") + kUnit + ' ' + command);
     }
 };
 
-TEST_F(Service, PlaysForTheInstalledTool) {
-    DaemonProcess daemon(asService());
-    ASSERT_TRUE(daemon.waitUntilServing()) << daemon.output().joined();
-    EXPECT_THAT(daemon.output().with("[Error]"), IsEmpty());
-    EXPECT_THAT(outputOf("/usr/bin/qnsmedia play /srv/sound.wav"), HasSubstr("0:01.0"));
-    EXPECT_EQ(daemon.terminate(), 0);
+TEST_F(Confinement, ForbidsWhatTheUnitDoesNotAllow) {
+    for (const char* command : {"/usr/bin/nice -n 1 /bin/true", "/usr/bin/unshare --user /bin/true",
+                                "/usr/bin/unshare --net /bin/true"})
+        EXPECT_THAT(confined(command).output, HasSubstr("Operation not permitted")) << command;
+    EXPECT_EQ(confined("/bin/true").status, 0);
 }
 
 /** An installed daemon whose engine is not the one it was built with. */
