@@ -47,6 +47,12 @@ std::optional<std::string> inEnvironmentCharset(std::wstring_view text) {
     return bytes;
 }
 
+/** Every locale's character set keeps ASCII, and to ask for the locale takes longer than a look. */
+bool isAscii(std::wstring_view text) {
+    return std::all_of(text.begin(), text.end(),
+                       [](wchar_t wide) { return wide >= 0 && wide < 0x80; });
+}
+
 void appendUtf8(std::string& bytes, char32_t code) {
     const auto trail = [&](int shift) {
         bytes += static_cast<char>(0x80 | ((code >> shift) & 0x3f));
@@ -127,6 +133,8 @@ wchar_t takeUtf8(std::string_view& bytes) {
 } // namespace
 
 std::string toBytes(std::wstring_view text) {
+    if (isAscii(text))
+        return {text.begin(), text.end()};
     if (auto bytes = inEnvironmentCharset(text))
         return *std::move(bytes);
     return toUtf8(text);
