@@ -4,6 +4,8 @@
 #include <algorithm>
 #include <vector>
 
+#include "probe/CodecHeader.h"
+
 namespace probe {
 
 namespace {
@@ -31,8 +33,15 @@ bool lacksDepth(const AVCodecParameters& known) {
 
 /** Containers say of AAC what the format was before its extensions doubled rate or channels. */
 bool hidesItsFormat(const AVCodecParameters& known) {
-    return known.codec_id == AV_CODEC_ID_AAC || known.codec_id == AV_CODEC_ID_AAC_LATM ||
-           lacksDepth(known);
+    const bool isAac = known.codec_id == AV_CODEC_ID_AAC || known.codec_id == AV_CODEC_ID_AAC_LATM;
+    return (isAac && !tellsAacFormat(known)) || lacksDepth(known);
+}
+
+/** Whether only its packets can tell what the stream is. */
+bool needsPacket(const AVStream& stream) {
+    if (isVideo(stream))
+        return true; // of cropping and interlacing containers know nothing
+    return isAudio(stream) && (!isKnown(stream) || hidesItsFormat(*stream.codecpar));
 }
 
 void takeFromParser(const AVCodecParserContext& parser, const AVCodecContext& codec,
@@ -94,10 +103,13 @@ void decode(const AVPacket& packet, AVCodecParameters& known) {
 }
 
 void completeFrom(const AVPacket& packet, AVStream& stream) {
+    AVCodecParameters& known = *stream.codecpar;
     if (isVideo(stream))
-        parse(packet, *stream.codecpar);
-    if (!isKnown(stream) || hidesItsFormat(*stream.codecpar))
-        decode(packet, *stream.codecpar);
+        parse(packet, known);
+    if (known.codec_id == AV_CODEC_ID_VP9 && known.format == AV_PIX_FMT_NONE)
+        known.format = pixelFormatOfVp9(packet);
+    if (!isKnown(stream) || hidesItsFormat(known))
+        decode(packet, known);
 }
 
 /** The streams whose first packet has not come yet. */
@@ -105,8 +117,7 @@ class Awaited {
 public:
     explicit Awaited(const AVFormatContext& context) {
         for (unsigned int index = 0; index < context.nb_streams; ++index) {
-            const AVStream& stream = *context.streams[index];
-            mAwaited.push_back(isVideo(stream) || isAudio(stream));
+            mAwaited.push_back(needsPacket(*context.streams[index]));
         }
     }
 
@@ -125,6 +136,13 @@ public:
 private:
     std::vector<bool> mAwaited;
 };
+
+void readHeaders(AVFormatContext& context) {
+    for (unsigned int index = 0; index < context.nb_streams; ++index) {
+        if (lacksDepth(*context.streams[index]->codecpar))
+            readLossless(*context.streams[index]->codecpar);
+    }
+}
 
 void readFirstPackets(AVFormatContext& context) {
     Awaited awaited(context);
@@ -152,7 +170,8 @@ bool lacksSomething(const AVFormatContext& context, bool isPicture) {
 
 void complete(MediaFile& file) {
     AVFormatContext& context = file.context();
-    if (!file.isAnalysed())
+    readHeaders(context);
+    if (!file.isAnalysed() && !file.isPicture())
         readFirstPackets(context);
     if (lacksSomething(context, file.isPicture()))
         file.analyse();

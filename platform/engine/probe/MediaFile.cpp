@@ -12,6 +12,8 @@
 #include "base/UniqueFd.h"
 #include "probe/Duration.h"
 #include "probe/Formats.h"
+#include "probe/PictureHeader.h"
+#include "probe/Signature.h"
 
 namespace probe {
 
@@ -76,14 +78,56 @@ std::int64_t durationOfStreams(const AVFormatContext& context) {
     return longest;
 }
 
-/** Formats whose header tells everything of sound, but not of the whole file. */
-bool tellsOfSound(const AVFormatContext& context) {
-    constexpr std::string_view kFormats[] = {"aiff", "au", "mp3", "ogg"};
+/** Formats whose header tells everything of a file that holds nothing but sound ... */
+constexpr std::string_view kTellOfSound[] = {"aiff", "asf", "au",  "caf", "flac",
+                                             "mp3",  "ogg", "tta", "wav", "wv"};
+
+/** ... and of one that holds films, too. */
+constexpr std::string_view kTellOfFilms[] = {"avi", "mxf"};
+
+template<std::size_t size>
+bool contains(const std::string_view (&names)[size], std::string_view name) {
+    return std::find(std::begin(names), std::end(names), name) != std::end(names);
+}
+
+/** Whether the header says what the stream is, and of a film also how fast it is. */
+bool isNamed(const AVStream& stream) {
+    if (!isPlayable(stream))
+        return true;
+    return stream.codecpar->codec_id != AV_CODEC_ID_NONE &&
+           (!isVideo(stream) || stream.avg_frame_rate.num > 0);
+}
+
+bool isToldByHeader(const AVFormatContext& context) {
     const std::string_view format = context.iformat->name;
-    const AVStream* const* const streams = context.streams;
-    return std::find(std::begin(kFormats), std::end(kFormats), format) != std::end(kFormats) &&
-           std::none_of(streams, streams + context.nb_streams,
-                        [](const AVStream* stream) { return isVideo(*stream); });
+    const AVStream* const* const begin = context.streams;
+    const AVStream* const* const end = begin + context.nb_streams;
+    const bool isFilm =
+        std::any_of(begin, end, [](const AVStream* stream) { return isVideo(*stream); });
+    return (contains(kTellOfFilms, format) || (!isFilm && contains(kTellOfSound, format))) &&
+           std::all_of(begin, end, [](const AVStream* stream) { return isNamed(*stream); });
+}
+
+template<std::size_t size>
+std::string_view readAt(AVIOContext& input, std::int64_t place, std::array<char, size>& buffer) {
+    if (avio_seek(&input, place, SEEK_SET) < 0)
+        return {};
+    const int count = avio_read(&input, reinterpret_cast<unsigned char*>(buffer.data()), size);
+    return {buffer.data(), static_cast<std::size_t>(std::max(count, 0))};
+}
+
+/** Compressed sound passes for samples in WAV files made to be copied to CDs. */
+bool isDisguised(AVIOContext& input) {
+    using namespace std::string_view_literals;
+    constexpr std::string_view kMarks[] = {"\x7f\xfe\x80\x01"sv, "\xfe\x7f\x01\x80"sv,
+                                           "\x1f\xff\xe8\x00"sv, "\xff\x1f\x00\xe8"sv,
+                                           "\x72\xf8\x1f\x4e"sv};
+    std::array<char, 16 * 1024> buffer;
+    const std::int64_t begin = avio_tell(&input);
+    const std::string_view sound = readAt(input, begin, buffer);
+    avio_seek(&input, begin, SEEK_SET);
+    return std::any_of(std::begin(kMarks), std::end(kMarks),
+                       [&](std::string_view mark) { return sound.find(mark) != sound.npos; });
 }
 
 } // namespace
@@ -114,6 +158,8 @@ int MediaFile::readHeader() {
         return kNotMedia;
     if (openInput() < 0)
         return kDamaged;
+    if (isPicture() && mContext->nb_streams == 1)
+        mReadPicture = readPictureHeader(*mContext->pb, *mContext->streams[0]->codecpar);
     if (!isClear())
         analyse();
     if (mContext->nb_streams == 0)
@@ -125,10 +171,15 @@ int MediaFile::readHeader() {
 }
 
 bool MediaFile::findFormat() {
-    std::array<unsigned char, 3> head{};
-    avio_read(mInput.context(), head.data(), head.size());
-    mTagged = head[0] == 'I' && head[1] == 'D' && head[2] == '3';
+    std::array<char, kSignatureReach> buffer;
+    std::string_view head = readAt(*mInput.context(), 0, buffer);
+    const std::size_t tagSize = sizeOfTag(head);
+    mTagged = tagSize > 0;
+    if (mTagged)
+        head = readAt(*mInput.context(), static_cast<std::int64_t>(tagSize), buffer);
     avio_seek(mInput.context(), 0, SEEK_SET);
+    if (const char* const format = formatBySignature(head))
+        return (mpFormat = av_find_input_format(format)) != nullptr;
     // Without the file's name: its ending proves nothing.
     const int score = av_probe_input_buffer2(mInput.context(), &mpFormat, nullptr, nullptr, 0, 0);
     return mpFormat && score >= kLeastScore && isTrusted(mpFormat->name);
@@ -142,15 +193,17 @@ int MediaFile::openInput() {
     context->probesize = 1024 * 1024;
     const int error = avformat_open_input(&context, nullptr, mpFormat, nullptr);
     mContext = FormatContext(kAdopt, context);
-    if (error >= 0 && mContext->duration <= 0 && tellsOfSound(*mContext.get()))
+    if (error >= 0 && mContext->duration <= 0 && isToldByHeader(*mContext.get()))
         mContext->duration = durationOfStreams(*mContext.get());
     return error;
 }
 
 /** True when the file's header has told all that playing needs. */
 bool MediaFile::isClear() const {
+    if (isPicture())
+        return mReadPicture;
     return mContext->nb_streams > 0 && (mContext->ctx_flags & AVFMTCTX_NOHEADER) == 0 &&
-           (mContext->duration > 0 || isPicture());
+           mContext->duration > 0 && !(formatName() == "wav" && isDisguised(*mContext->pb));
 }
 
 bool MediaFile::isPicture() const {

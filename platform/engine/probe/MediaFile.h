@@ -91,6 +91,7 @@ private:
     FileInput mInput;
     const AVInputFormat* mpFormat = nullptr;
     bool mTagged = false;
+    bool mReadPicture = false; ///< its header has told all there is to know
     bool mAnalysed = false;
     bool mDurationKnown = false;
     Duration mDuration;
