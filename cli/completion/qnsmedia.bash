@@ -1,0 +1,59 @@
+# SPDX-License-Identifier: MIT
+# Completion of qnsmedia(1) in bash.
+
+# The command among the words before the cursor; nothing when there is none yet.
+_qnsmedia_command() {
+    local i
+    for ((i = 1; i < COMP_CWORD; ++i)); do
+        case ${COMP_WORDS[i]} in
+        --identity | --timeout) ((++i)) ;;
+        -*) ;;
+        *)
+            echo "${COMP_WORDS[i]}"
+            return
+            ;;
+        esac
+    done
+}
+
+_qnsmedia_words() {
+    mapfile -t COMPREPLY < <(compgen -W "$1" -- "${COMP_WORDS[COMP_CWORD]}")
+}
+
+_qnsmedia_files() {
+    compopt -o filenames 2>/dev/null
+    mapfile -t COMPREPLY < <(compgen -f -- "${COMP_WORDS[COMP_CWORD]}")
+}
+
+# Options when one has been begun, otherwise files.
+_qnsmedia_options_or_files() {
+    if [[ ${COMP_WORDS[COMP_CWORD]} == -* ]]; then
+        _qnsmedia_words "$1"
+    else
+        _qnsmedia_files
+    fi
+}
+
+_qnsmedia() {
+    local command before=${COMP_WORDS[COMP_CWORD - 1]}
+    COMPREPLY=()
+    command=$(_qnsmedia_command)
+    case $command:$before in
+    :--identity) _qnsmedia_words "$(echo {1000..1007})" ;;
+    :--timeout | image:--at | image:--size) ;;
+    image:-o | image:--output) _qnsmedia_files ;;
+    :*)
+        if [[ ${COMP_WORDS[COMP_CWORD]} == -* ]]; then
+            _qnsmedia_words '-h --help --version --identity --timeout'
+        else
+            _qnsmedia_words 'play status info image extensions'
+        fi
+        ;;
+    play:*) _qnsmedia_options_or_files '-h --help' ;;
+    status:* | extensions:*) _qnsmedia_words '-h --help --json' ;;
+    info:*) _qnsmedia_options_or_files '-h --help --json' ;;
+    image:*) _qnsmedia_options_or_files '-h --help -o --output --at --size' ;;
+    esac
+}
+
+complete -F _qnsmedia qnsmedia
