@@ -45,6 +45,11 @@ std::string toLine(const LibMediaPlayer::MediaPlayerNotify& notification) {
            script::quoted(notification.text);
 }
 
+std::string toLine(const LibMediaPlayer::MediaImporterNotify& notification) {
+    return "notify " + std::to_string(notification.kind) + ' ' +
+           std::to_string(notification.result) + ' ' + script::quoted(notification.text);
+}
+
 } // namespace
 
 EngineScript::EngineScript()
@@ -86,8 +91,23 @@ void EngineScript::notifyAtOnce(
     awaitNotified();
 }
 
+void EngineScript::notifyImport(const LibMediaPlayer::MediaImporterNotify& notification) {
+    notifyImportsAtOnce({notification});
+}
+
+void EngineScript::notifyImportsAtOnce(
+    const std::vector<LibMediaPlayer::MediaImporterNotify>& notifications) {
+    order(notifications);
+    awaitNotified();
+}
+
 void EngineScript::startNotify(
     const std::vector<LibMediaPlayer::MediaPlayerNotify>& notifications) {
+    order(notifications);
+}
+
+template<typename Notification>
+void EngineScript::order(const std::vector<Notification>& notifications) {
     for (const auto& notification : notifications)
         mOrders.send(toLine(notification));
     mOrders.send("deliver");

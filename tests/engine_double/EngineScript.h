@@ -7,6 +7,7 @@
 #include <string_view>
 #include <vector>
 
+#include "LibMediaPlayer/IMediaImporter.h"
 #include "LibMediaPlayer/IMediaPlayer.h"
 #include "base/UniqueFd.h"
 #include "tests/engine_double/LineChannel.h"
@@ -24,12 +25,13 @@
  *     engine.notify(opened);
  *
  * The discoverers of a process have a script of their own, which the environment variable
- * QNS_DISCOVERER_DOUBLE names; their calls look as ScriptedDiscoverer describes.
+ * QNS_DISCOVERER_DOUBLE names; their calls look as ScriptedDiscoverer describes. So has its
+ * importer: QNS_IMPORTER_DOUBLE, ScriptedImporter.
  *
- * One player at a time; when it has gone, the next one is waited for. Nothing here waits for
- * time to pass, only, at most kPatience, for the engine; when that is too long the test fails.
- * When the script goes, a blocked call returns 0. For one thread, which must not be the one that
- * calls the engine.
+ * One player or importer at a time; when it has gone, the next one is waited for. Nothing here
+ * waits for time to pass, only, at most kPatience, for the engine; when that is too long the test
+ * fails. When the script goes, a blocked call returns 0. For one thread, which must not be the one
+ * that calls the engine.
  */
 class EngineScript {
 public:
@@ -58,11 +60,17 @@ public:
     /** The same for several notifications at the same time, each on its own thread. */
     void notifyAtOnce(const std::vector<LibMediaPlayer::MediaPlayerNotify>& notifications);
 
+    /** The same of an importer. */
+    void notifyImport(const LibMediaPlayer::MediaImporterNotify& notification);
+    void notifyImportsAtOnce(const std::vector<LibMediaPlayer::MediaImporterNotify>& notifications);
+
     /** The two halves of notifyAtOnce(), for a test that does something in between. */
     void startNotify(const std::vector<LibMediaPlayer::MediaPlayerNotify>& notifications);
     void awaitNotified();
 
 private:
+    template<typename Notification>
+    void order(const std::vector<Notification>& notifications);
     bool acceptPlayer();
     qns::UniqueFd acceptConnection();
 

@@ -1,30 +1,25 @@
 // SPDX-License-Identifier: MIT
 #include "LibMediaPlayer/InterfaceFactory.h"
 
-#include <cstdlib>
 #include <memory>
 #include <string>
 
 #include "tests/engine_double/ScriptedDiscoverer.h"
+#include "tests/engine_double/ScriptedImporter.h"
 #include "tests/engine_double/ScriptedPlayer.h"
 
 namespace LibMediaPlayer {
 
 namespace {
 
-/** A connection to the script, or a closed channel when there is none. */
 script::LineChannel connectToScript() {
-    const char* const path = std::getenv("QNS_ENGINE_DOUBLE");
-    return path ? script::LineChannel::connectTo(path) : script::LineChannel();
+    return script::LineChannel::connectToNamedBy("QNS_ENGINE_DOUBLE");
 }
 
 /** Asks the script whether there is to be a player. */
 bool allowed(script::LineChannel& calls, const void* window, unsigned int flags) {
-    if (!calls.isOpen())
-        return true;
-    calls.send(std::string("player create ") + (window ? "window " : "null ") +
-               std::to_string(flags));
-    return calls.receive() != "null";
+    return calls.ask(std::string("player create ") + (window ? "window " : "null ") +
+                     std::to_string(flags)) != "null";
 }
 
 } // namespace
@@ -42,7 +37,7 @@ IMediaDiscoverer* InterfaceFactory::createDiscoverer() {
 }
 
 IMediaImporter* InterfaceFactory::createImporter() {
-    return nullptr;
+    return ScriptedImporter::create().release();
 }
 
 } // namespace LibMediaPlayer

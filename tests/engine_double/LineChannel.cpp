@@ -5,6 +5,7 @@
 #include <array>
 #include <cerrno>
 #include <climits>
+#include <cstdlib>
 #include <cstring>
 
 #include <poll.h>
@@ -44,6 +45,11 @@ LineChannel LineChannel::connectTo(const std::string& path) {
     return LineChannel(std::move(socket));
 }
 
+LineChannel LineChannel::connectToNamedBy(const char* variable) {
+    const char* const path = std::getenv(variable);
+    return path ? connectTo(path) : LineChannel();
+}
+
 void LineChannel::send(std::string_view line) {
     std::string rest(line);
     rest += '\n';
@@ -65,6 +71,13 @@ std::optional<std::string> LineChannel::receive(Clock::time_point deadline) {
         if (!fill(deadline))
             return std::nullopt;
     }
+}
+
+std::string LineChannel::ask(std::string_view line) {
+    if (!isOpen())
+        return {};
+    send(line);
+    return receive().value_or("");
 }
 
 bool LineChannel::fill(Clock::time_point deadline) {

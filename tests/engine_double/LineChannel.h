@@ -21,6 +21,9 @@ public:
     /** A channel to the unix socket at `path`; without a peer when nobody serves it. */
     static LineChannel connectTo(const std::string& path);
 
+    /** The same for the path in an environment variable; closed when there is none. */
+    static LineChannel connectToNamedBy(const char* variable);
+
     [[nodiscard]] bool isOpen() const { return static_cast<bool>(mSocket); }
 
     /** What cannot be sent any more is dropped. */
@@ -28,6 +31,9 @@ public:
 
     /** The next line without its end; nothing when the peer has gone or the deadline passed. */
     std::optional<std::string> receive(Clock::time_point deadline = Clock::time_point::max());
+
+    /** Sends a line and waits for the next one; empty when there is none, or no peer. */
+    std::string ask(std::string_view line);
 
     /** Ends a receive() that waits, for good. */
     void shutDown();

@@ -74,4 +74,12 @@ unsigned long unsignedNumber(const std::wstring& word) {
     return std::wcstoul(word.c_str(), nullptr, 10);
 }
 
+int resultIn(const std::vector<std::wstring>& answer) {
+    return answer.size() > 1 ? static_cast<int>(number(answer[1])) : 0;
+}
+
+int resultIn(std::string_view answer) {
+    return resultIn(words(answer));
+}
+
 } // namespace script

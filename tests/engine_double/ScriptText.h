@@ -23,4 +23,8 @@ std::vector<std::wstring> words(std::string_view line);
 long number(const std::wstring& word);
 unsigned long unsignedNumber(const std::wstring& word);
 
+/** The result in an answer such as `return 3`, 0 when there is none. */
+int resultIn(const std::vector<std::wstring>& answer);
+int resultIn(std::string_view answer);
+
 } // namespace script

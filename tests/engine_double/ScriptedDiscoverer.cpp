@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include "tests/engine_double/ScriptedDiscoverer.h"
 
-#include <cstdlib>
 #include <mutex>
 
 #include "tests/engine_double/LineChannel.h"
@@ -20,10 +19,7 @@ public:
 
     std::string ask(const std::string& call) {
         const std::lock_guard lock(mMutex);
-        if (!mCalls.isOpen())
-            return {};
-        mCalls.send(call);
-        return mCalls.receive().value_or("");
+        return mCalls.ask(call);
     }
 
     int nextNumber() {
@@ -32,22 +28,17 @@ public:
     }
 
 private:
-    Script() {
-        if (const char* const path = std::getenv("QNS_DISCOVERER_DOUBLE")) {
-            mCalls = script::LineChannel::connectTo(path);
-            mOrders = script::LineChannel::connectTo(path);
-        }
+    Script() = default;
+
+    static script::LineChannel connect() {
+        return script::LineChannel::connectToNamedBy("QNS_DISCOVERER_DOUBLE");
     }
 
     std::mutex mMutex; ///< guards all below
-    script::LineChannel mCalls;
-    script::LineChannel mOrders; ///< there are none, but scripts wait for it
+    script::LineChannel mCalls = connect();
+    script::LineChannel mOrders = connect(); ///< there are none, but scripts wait for it
     int mNextNumber = 0;
 };
-
-int resultIn(const std::vector<std::wstring>& answer) {
-    return answer.size() > 1 ? static_cast<int>(script::number(answer[1])) : 0;
-}
 
 } // namespace
 
@@ -74,7 +65,7 @@ int ScriptedDiscoverer::close() {
 int ScriptedDiscoverer::metadata(LibMediaPlayer::MediaMetaInfo& info) {
     const auto answer = ask("metadata");
     info = script::metadataIn(answer);
-    return resultIn(answer);
+    return script::resultIn(answer);
 }
 
 int ScriptedDiscoverer::reserved5() {
@@ -95,7 +86,7 @@ int ScriptedDiscoverer::supportedExtensions(LibMediaPlayer::SupportedExtensions&
     const auto answer = ask("extensions");
     if (answer.size() > 3)
         extensions = {answer[2], static_cast<int32_t>(script::number(answer[3]))};
-    return resultIn(answer);
+    return script::resultIn(answer);
 }
 
 std::vector<std::wstring> ScriptedDiscoverer::ask(std::string_view call) const {
@@ -104,5 +95,5 @@ std::vector<std::wstring> ScriptedDiscoverer::ask(std::string_view call) const {
 }
 
 int ScriptedDiscoverer::call(std::string_view call) const {
-    return resultIn(ask(call));
+    return script::resultIn(ask(call));
 }

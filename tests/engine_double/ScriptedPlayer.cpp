@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include "tests/engine_double/ScriptedPlayer.h"
 
-#include <condition_variable>
 #include <optional>
 #include <utility>
 
@@ -28,38 +27,13 @@ std::optional<MediaPlayerNotify> toNotification(const std::vector<std::wstring>&
                              script::number(words[8])};
 }
 
-/** Lets several threads pass at the same moment. */
-class Gate {
-public:
-    void pass() {
-        std::unique_lock lock(mMutex);
-        mOpened.wait(lock, [this] { return mOpen; });
-    }
-    void open() {
-        const std::lock_guard lock(mMutex);
-        mOpen = true;
-        mOpened.notify_all();
-    }
-
-private:
-    std::mutex mMutex;
-    std::condition_variable mOpened;
-    bool mOpen = false;
-};
-
 } // namespace
 
 ScriptedPlayer::ScriptedPlayer(script::LineChannel calls, script::LineChannel orders)
-    : mCalls(std::move(calls)), mOrders(std::move(orders)) {
-    if (mOrders.isOpen())
-        mOrderThread = std::thread(&ScriptedPlayer::takeOrders, this);
-}
+    : mCalls(std::move(calls)), mNotifications(std::move(orders), toNotification) {}
 
 ScriptedPlayer::~ScriptedPlayer() {
     call("player destroy");
-    mOrders.shutDown();
-    if (mOrderThread.joinable())
-        mOrderThread.join();
 }
 
 int ScriptedPlayer::open(const std::wstring& path, int format) {
@@ -90,8 +64,7 @@ int ScriptedPlayer::status(long& position, long& duration) {
 }
 
 void ScriptedPlayer::setNotify(std::function<void(MediaPlayerNotify&)> notify) {
-    const std::lock_guard lock(mMutex);
-    mNotify = std::move(notify);
+    mNotifications.setFunction(std::move(notify));
 }
 
 int ScriptedPlayer::dumpGraph(const std::wstring& path) {
@@ -104,46 +77,9 @@ int ScriptedPlayer::repeat(LibMediaPlayer::RepeatParam& param) {
 }
 
 std::vector<std::wstring> ScriptedPlayer::ask(std::string_view call) {
-    if (!mCalls.isOpen())
-        return {};
-    mCalls.send(call);
-    return script::words(mCalls.receive().value_or(""));
+    return script::words(mCalls.ask(call));
 }
 
 int ScriptedPlayer::call(std::string_view call) {
-    const auto answer = ask(call);
-    return answer.size() > 1 ? static_cast<int>(script::number(answer[1])) : 0;
-}
-
-void ScriptedPlayer::takeOrders() {
-    std::vector<MediaPlayerNotify> kept;
-    while (const auto line = mOrders.receive()) {
-        if (const auto notification = toNotification(script::words(*line))) {
-            kept.push_back(*notification);
-        } else if (*line == "deliver") {
-            deliver(std::exchange(kept, {}));
-            mOrders.send("delivered");
-        }
-    }
-}
-
-void ScriptedPlayer::deliver(std::vector<MediaPlayerNotify> notifications) {
-    Gate gate;
-    std::vector<std::thread> threads;
-    for (auto& notification : notifications)
-        threads.emplace_back([&] {
-            gate.pass();
-            deliverOne(notification);
-        });
-    gate.open();
-    for (auto& thread : threads)
-        thread.join();
-}
-
-void ScriptedPlayer::deliverOne(MediaPlayerNotify& notification) {
-    std::unique_lock lock(mMutex);
-    const auto notify = mNotify;
-    lock.unlock();
-    if (notify)
-        notify(notification);
+    return script::resultIn(ask(call));
 }

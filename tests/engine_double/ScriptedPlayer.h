@@ -1,23 +1,22 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <mutex>
+#include <functional>
 #include <string>
 #include <string_view>
-#include <thread>
 #include <vector>
 
 #include "LibMediaPlayer/IMediaPlayer.h"
 #include "tests/engine_double/LineChannel.h"
+#include "tests/engine_double/ScriptedNotifications.h"
 
 /**
  * A player that plays nothing. With a script it reports each call as a line, such as
  * `player open "/a b.mp4" 2`, and waits for the answer, such as `return 0`; for status
  * `return 3 position duration`. Without one, or when it has gone, every call succeeds.
  *
- * On its second connection it takes orders: `notify type result param1 param2 param3 uvalue1
- * uvalue2 value "text"` keeps a notification, and `deliver` delivers those that are kept, all at
- * once, each on a thread of its own, and answers `delivered` when all have come back.
+ * The orders on its second connection are `notify type result param1 param2 param3 uvalue1
+ * uvalue2 value "text"`, and `deliver` as ScriptedNotifications says.
  */
 class ScriptedPlayer : public LibMediaPlayer::IMediaPlayer {
 public:
@@ -42,13 +41,6 @@ private:
     std::vector<std::wstring> ask(std::string_view call);
     int call(std::string_view call);
 
-    void takeOrders();
-    void deliver(std::vector<LibMediaPlayer::MediaPlayerNotify> notifications);
-    void deliverOne(LibMediaPlayer::MediaPlayerNotify& notification);
-
     script::LineChannel mCalls;
-    script::LineChannel mOrders;
-    std::mutex mMutex; ///< guards mNotify
-    std::function<void(LibMediaPlayer::MediaPlayerNotify&)> mNotify;
-    std::thread mOrderThread;
+    script::ScriptedNotifications<LibMediaPlayer::MediaPlayerNotify> mNotifications;
 };
