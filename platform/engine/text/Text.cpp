@@ -49,8 +49,7 @@ std::optional<std::string> inEnvironmentCharset(std::wstring_view text) {
 
 /** Every locale's character set keeps ASCII, and to ask for the locale takes longer than a look. */
 bool isAscii(std::wstring_view text) {
-    return std::all_of(text.begin(), text.end(),
-                       [](wchar_t wide) { return wide >= 0 && wide < 0x80; });
+    return std::all_of(text.begin(), text.end(), [](char32_t wide) { return wide < 0x80; });
 }
 
 void appendUtf8(std::string& bytes, char32_t code) {
