@@ -69,4 +69,7 @@ foreach(component IN LISTS components)
     endif()
 endforeach()
 
-include(CPack)
+# Which libraries a program needs is known of this machine's packages only.
+if(NOT CMAKE_CROSSCOMPILING)
+    include(CPack)
+endif()
