@@ -1,60 +1,20 @@
 // SPDX-License-Identifier: MIT
 #include <clocale>
 #include <cstdlib>
-#include <fstream>
 #include <map>
-#include <sstream>
+#include <set>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "tests/daemon/support/DaemonTest.h"
+#include "tests/daemon/support/ProtocolPage.h"
+#include "tests/engine_double/MetadataText.h"
 
+using testing::StartsWith;
 using wire::Bytes;
 
 namespace {
-
-/** A fenced block of the page: the words behind the fence, and its lines. */
-struct Block {
-    std::string title;
-    std::vector<std::string> lines;
-};
-
-std::vector<Block> blocksOfPage() {
-    std::ifstream page(QNS_SOURCE_DIR "/docs/protocol.md");
-    EXPECT_TRUE(page);
-    std::vector<Block> blocks;
-    bool inside = false;
-    for (std::string line; std::getline(page, line);) {
-        const bool fence = line.rfind("```", 0) == 0;
-        if (fence && !inside)
-            blocks.push_back({line.substr(3), {}});
-        else if (!fence && inside)
-            blocks.back().lines.push_back(line);
-        inside = fence != inside;
-    }
-    return blocks;
-}
-
-std::string withoutComment(const std::string& line) {
-    return line.substr(0, line.find('#'));
-}
-
-Bytes argumentsIn(const Block& block) {
-    Bytes bytes;
-    for (const auto& line : block.lines)
-        bytes += wire::hex(withoutComment(line));
-    return bytes;
-}
-
-/** Lines are `offset: bytes`; what no line names is zero. */
-Bytes packetIn(const Block& block) {
-    Bytes packet(wire::kPacketSize, '\0');
-    for (const auto& line : block.lines) {
-        const auto bytes = wire::hex(withoutComment(line).substr(line.find(':') + 1));
-        packet.replace(std::stoul(line, nullptr, 16), bytes.size(), bytes);
-    }
-    return packet;
-}
 
 std::wstring widened(const std::string& text) {
     std::setlocale(LC_CTYPE, "C.UTF-8");
@@ -63,35 +23,76 @@ std::wstring widened(const std::string& text) {
     return wide;
 }
 
-constexpr std::size_t kAddressOffset = 24;
+/** What the page's engine tells of the page's film. */
+LibMediaPlayer::MediaMetaInfo film() {
+    LibMediaPlayer::MediaMetaInfo info;
+    info.system = {"video/mp4", L"TITLE=Film\n", true, false, 10'000'000'000};
+    info.videoCount = 1;
+    info.video = {"video/x-h264", L"H.264", 640,       360,  24, 25, 1, 1, 1,
+                  false,          800'000,  1'000'000, false};
+    info.audioCount = 1;
+    info.audio[0] = {"audio/mpeg", L"AAC", 2, 48'000, 0, 128'000, 128'000};
+    return info;
+}
 
-/** The page's conversation: client 1000 with the callback object 10 and the notify object 11. */
-class ProtocolPage : public ScriptedDaemonTest {
+/** The numbers that the page's client gives its objects, and where the service is. */
+struct Service {
+    long object;
+    std::int64_t callbackObject;
+    std::int64_t notifyObject;
+    std::set<long> requests;
+};
+
+const std::map<std::string, Service> kServices{
+    {"player", {62, 10, 11, {1, 2, 3, 4, 5, 6, 7, 8, 9, 11, 12, 14}}},
+    {"discoverer", {51, 20, 0, {1, 2, 3, 4, 5, 6, 7, 8}}},
+    {"importer", {56, 30, 31, {1, 2, 3, 4, 5, 6, 7, 8}}},
+};
+
+constexpr std::size_t kAddressOffset = 24;
+constexpr int kDiscoverers = 11;
+
+/** The page's client, and a daemon whose whole engine does what the page tells. */
+class ProtocolPage : public DaemonTest {
 protected:
-    void play(const Block& block) {
-        std::istringstream title(block.title);
-        std::string kind;
-        title >> kind;
+    void SetUp() override {
+        auto options = withEngineDouble();
+        options.environment["QNS_ENGINE_DOUBLE"] = mPlayer.address();
+        options.environment["QNS_DISCOVERER_DOUBLE"] = mDiscoverers.address();
+        options.environment["QNS_IMPORTER_DOUBLE"] = mImporter.address();
+        start(options);
+        for (int number = 0; number < kDiscoverers; ++number) {
+            if (number == kDiscoverers - 1)
+                mImporter.expectCall("importer create");
+            mDiscoverers.expectCall("discoverer " + std::to_string(number) + " create");
+        }
+        mPlayer.expectCall("player create null 15");
+        ASSERT_TRUE(mpDaemon->waitUntilServing()) << mpDaemon->output().joined();
+        mClient.connect();
+    }
+
+    void play(const PageBlock& block) {
         if (block.title == "packet to-daemon")
-            mClient.sendBytes(packetIn(block));
-        else if (block.title == "packet to-client")
-            expectPacket(packetIn(block));
-        else if (kind == "request")
-            sendRequest(numberIn(title), argumentsIn(block));
-        else if (kind == "callback")
-            expectArguments(10, numberIn(title), argumentsIn(block));
-        else if (kind == "notification")
-            expectNotification(argumentsIn(block));
+            mClient.sendBytes(block.packet());
+        else if (block.kind == "packet")
+            expectPacket(block);
+        else if (block.kind == "request")
+            sendRequest(block);
+        else if (block.kind == "callback")
+            expectArguments(block, kServices.at(block.service).callbackObject, block.method);
+        else if (block.kind == "notification")
+            expectNotification(block);
+        else if (block.kind == "acknowledgement")
+            EXPECT_EQ(block.bytes(), wire::kAcknowledgement);
         else
             ADD_FAILURE() << "An unknown kind of block";
     }
 
     void registerClient() {
-        mClient.connect();
-        sendRequest(request::kRegisterCallBack, wire::integer(10) + wire::integer(1000));
+        mClient.request(request::kRegisterCallBack, wire::integer(10) + wire::integer(1000));
         ASSERT_TRUE(mClient.receive());
-        sendRequest(request::kRegisterNotify,
-                    wire::integer(11) + wire::integer(1000) + wire::integer(1));
+        mClient.request(request::kRegisterNotify,
+                        wire::integer(11) + wire::integer(1000) + wire::integer(1));
         mClient.expectNothingElse();
     }
 
@@ -112,7 +113,7 @@ protected:
             event.uvalue1 = static_cast<unsigned long>(number);
         else
             event.value = number;
-        mEngine.notify(event);
+        mPlayer.notify(event);
         const auto packet = mClient.receive();
         return packet ? itemOf(kind, packet->payload) : Bytes();
     }
@@ -120,43 +121,110 @@ protected:
     PlayerClient mClient{1000};
 
 private:
-    static long numberIn(std::istream& title) {
-        long number = 0;
-        title >> number;
-        return number;
+    /** A call of the engine, how it begins, and what the engine answers. */
+    struct Call {
+        EngineScript& script;
+        std::string beginning;
+        std::string answer = "return 0";
+    };
+
+    void sendRequest(const PageBlock& block) {
+        mClient.send(
+            {8, kServices.at(block.service).object, block.method, false, true, block.bytes()});
+        for (const auto& [script, beginning, answer] : callsFor(block)) {
+            EXPECT_THAT(script.nextCall(), StartsWith(beginning));
+            script.answer(answer);
+        }
     }
 
-    void sendRequest(long method, const Bytes& arguments) {
-        mClient.request(method, arguments);
-        const std::map<long, std::pair<const char*, const char*>> calls{
-            {request::kOpenPlayer, {"player open \"/media/film.mp4\" 2", "return 0"}},
-            {request::kPlay, {"player play", "return 0"}},
-            {request::kSeek, {"player seek 1500000000 0", "return 0"}},
-            {request::kSetRepeat, {"player repeat true 1000000000 2000000000", "return 0"}},
-            {request::kPause, {"player pause", "return 0"}},
-            {request::kClosePlayer, {"player close", "return 0"}},
-            {request::kGetPlayerStatus, {"player status", "return 3 1500000000 10000000000"}}};
-        const auto call = calls.find(method);
-        if (call == calls.end() || (method == request::kGetPlayerStatus && !mOpen))
-            return;
-        mOpen = method != request::kClosePlayer;
-        mEngine.expectCall(call->second.first, call->second.second);
+    std::vector<Call> callsFor(const PageBlock& block) {
+        if (block.service == "discoverer")
+            return discovererCalls(block.method);
+        return block.service == "importer" ? importerCalls(block.method)
+                                           : playerCalls(block.method);
     }
 
-    void expectPacket(const Bytes& expected) {
+    std::vector<Call> playerCalls(long method) {
+        switch (method) {
+        case request::kInitializePlayer:
+            return {{mPlayer, "player open \"/"}, {mPlayer, "player close"}};
+        case request::kOpenPlayer:
+            mOpen = true;
+            return {{mPlayer, "player open \"/media/film.mp4\" 2"}};
+        case request::kClosePlayer:
+            mOpen = false;
+            return {{mPlayer, "player close"}};
+        case request::kPlay:
+            return {{mPlayer, "player play"}};
+        case request::kPause:
+            return {{mPlayer, "player pause"}};
+        case request::kSeek:
+            return {{mPlayer, "player seek 1500000000 0"}};
+        case request::kSetRepeat:
+            return {{mPlayer, "player repeat true 1000000000 2000000000"}};
+        case request::kPowerOffMediaPlayer:
+            return {{mPlayer, "player destroy"}};
+        default:
+            if (method == request::kGetPlayerStatus && mOpen)
+                return {{mPlayer, "player status", "return 3 1500000000 10000000000"}};
+            return {};
+        }
+    }
+
+    std::vector<Call> discovererCalls(long method) {
+        switch (method) {
+        case 2:
+            return {{mDiscoverers, "discoverer 0 open \"/media/film.mp4\""}};
+        case 3:
+            return {{mDiscoverers, "discoverer 0 close"}};
+        case 4:
+            return {{mDiscoverers, "discoverer 0 metadata", script::metadataAnswer(0, film())}};
+        case 5:
+            return {{mDiscoverers, "discoverer 0 metadata", script::metadataAnswer(0, film())},
+                    {mDiscoverers, "discoverer 0 makeImage 1500000000 320 0 \"/srv/film.jpg\""}};
+        case 6:
+            return {{mDiscoverers, "discoverer 0 extensions", "return 0 \"mkv,mp4\" 2"}};
+        default:
+            return {};
+        }
+    }
+
+    std::vector<Call> importerCalls(long method) {
+        switch (method) {
+        case 2:
+            return {{mDiscoverers, "discoverer 10 open \"/media/film.mp4\""},
+                    {mDiscoverers, "discoverer 10 metadata", script::metadataAnswer(0, film())},
+                    {mDiscoverers, "discoverer 10 close"},
+                    {mImporter, "importer import \"/media/film.mp4\" \"Films\""}};
+        case 3:
+            return {{mImporter, "importer cancel"}};
+        case 4:
+            return {{mImporter, "importer status", "return 1 0 1000000"}};
+        default:
+            return {};
+        }
+    }
+
+    void expectPacket(const PageBlock& block) {
+        if (block.title == "packet notification")
+            mPlayer.notify({3, 0, L"", 0, 0, 0, 0, 0, 10'000'000'000});
         auto packet = mClient.receiveBytes();
+        const auto expected = block.packet();
         ASSERT_EQ(packet.size(), expected.size());
         packet.replace(kAddressOffset, 8, 8, '\0');
-        EXPECT_TRUE(packet == expected) << wire::toHex(packet.substr(0, 80));
+        EXPECT_TRUE(packet == expected) << wire::toHex(packet.substr(0, 100));
     }
 
-    void expectArguments(std::int64_t object, long method, const Bytes& arguments) {
-        EXPECT_EQ(mClient.receive(), (wire::Packet{1, object, method, true, true, arguments}));
+    void expectArguments(const PageBlock& block, std::int64_t object, long method) {
+        EXPECT_EQ(mClient.receive(), (wire::Packet{1, object, method, true, true, block.bytes()}));
     }
 
-    void expectNotification(const Bytes& arguments) {
-        mEngine.notify({1, 0, L"/media/film.mp4", 1, 2, 0, 1, 0, 10'000'000'000});
-        expectArguments(11, 1, arguments);
+    void expectNotification(const PageBlock& block) {
+        if (block.service == "importer")
+            mImporter.notifyImport({3, 0, L"/media/film.mp4"});
+        else
+            mPlayer.notify({1, 0, L"/media/film.mp4", 1, 2, 0, 1, 0, 10'000'000'000});
+        expectArguments(block, kServices.at(block.service).notifyObject, 1);
     }
 
     /** All fields but the one of interest are zero, so that they have known lengths. */
@@ -171,31 +239,42 @@ private:
         return payload.substr(before, payload.size() - before - after);
     }
 
+    EngineScript mPlayer;
+    EngineScript mDiscoverers;
+    EngineScript mImporter;
     bool mOpen = false;
 };
 
 TEST_F(ProtocolPage, ShowsAConversationAsItIs) {
-    mClient.connect();
     std::map<std::string, int> kinds;
     for (const auto& block : blocksOfPage()) {
-        if (block.title == "items")
+        if (block.kind == "items")
             continue;
         SCOPED_TRACE(block.title);
         ASSERT_NO_FATAL_FAILURE(play(block));
-        ++kinds[block.title.substr(0, block.title.find(' '))];
+        ++kinds[block.kind];
     }
-    EXPECT_EQ(kinds["packet"], 2);
-    EXPECT_EQ(kinds["request"], 9);
-    EXPECT_EQ(kinds["callback"], 8);
-    EXPECT_EQ(kinds["notification"], 1);
-    mClient.expectNothingElse();
+    EXPECT_EQ(kinds["packet"], 3);
+    EXPECT_EQ(kinds["callback"], 22);
+    EXPECT_EQ(kinds["notification"], 2);
+    EXPECT_EQ(kinds["acknowledgement"], 1);
+}
+
+TEST_F(ProtocolPage, ShowsEveryRequestOfEveryService) {
+    std::map<std::string, std::set<long>> requests;
+    for (const auto& block : blocksOfPage()) {
+        if (block.kind == "request")
+            requests[block.service].insert(block.method);
+    }
+    for (const auto& [name, service] : kServices)
+        EXPECT_EQ(requests[name], service.requests) << name;
 }
 
 TEST_F(ProtocolPage, ShowsItemsAsTheDaemonWritesThem) {
     registerClient();
     int count = 0;
     for (const auto& block : blocksOfPage()) {
-        if (block.title != "items")
+        if (block.kind != "items")
             continue;
         for (const auto& line : block.lines) {
             const auto colon = line.rfind(':');

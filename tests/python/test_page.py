@@ -11,6 +11,7 @@ from support import PATIENCE, Events, Peer, blocks_of_page, bytes_in
 
 SECOND = 10 ** 9
 FILM = "/media/film.mp4"
+CLIENT_ID = bytes.fromhex("D2 00 00 00 01")
 
 
 def packet_in(lines):
@@ -69,10 +70,12 @@ class PageTest(unittest.TestCase):
     PREFIX = ""
     REGISTRATIONS = ()
     UNREGISTRATIONS = ()
+    WITHOUT_ANSWER = ()
 
     def setUp(self):
         self.requests = self.blocks("request")
-        self.answers = collections.deque(self.blocks("callback"))
+        self.answers = collections.deque(
+            (method, arguments) for method, arguments in self.blocks("callback") if method != 1)
         self.callback_object = None
         self.peer = Peer(self.answer)
         self.addCleanup(self.peer.close)
@@ -88,8 +91,8 @@ class PageTest(unittest.TestCase):
         if packet.method == self.REGISTRATIONS[0]:
             self.callback_object = qnsmedia.Reader(packet.arguments).integer()
             self.peer.connect_to(1000)
-            return [Packet(1, self.callback_object, 1, True, bytes.fromhex("D2 00000001"))]
-        if packet.method in self.REGISTRATIONS + self.UNREGISTRATIONS:
+            return [Packet(1, self.callback_object, 1, True, CLIENT_ID)]
+        if packet.method in self.REGISTRATIONS + self.WITHOUT_ANSWER:
             return []
         method, arguments = self.answers.popleft()
         return [Packet(1, self.callback_object, method, True, arguments)]
@@ -116,9 +119,12 @@ class PageTest(unittest.TestCase):
 class ThePagesPlayer(PageTest):
     REGISTRATIONS = (13, 14)
     UNREGISTRATIONS = (10, 11)
+    WITHOUT_ANSWER = UNREGISTRATIONS + (12,)
 
     def test_is_talked_to_as_shown(self):
         player = qnsmedia.Player(self.connection)
+        player.initialize()
+        player.set_display(60)
         player.open(FILM)
         player.play()
         player.seek(3 * SECOND // 2)
@@ -129,6 +135,7 @@ class ThePagesPlayer(PageTest):
         player.close()
         self.assertEqual(player.status(),
                          qnsmedia.PlayerState(qnsmedia.PlayerStatus.NOT_READY, 0, 0))
+        player.power_off()
         self.expect_requests_of_page()
 
     def test_notifies_as_shown(self):
@@ -141,6 +148,52 @@ class ThePagesPlayer(PageTest):
             10 * SECOND))
         self.assertTrue(event.seekable)
         self.assertFalse(event.live)
+
+
+class ThePagesDiscoverer(PageTest):
+    PREFIX = "discoverer "
+    REGISTRATIONS = (8,)
+    UNREGISTRATIONS = WITHOUT_ANSWER = (7,)
+
+    def test_is_talked_to_as_shown(self):
+        discoverer = qnsmedia.Discoverer(self.connection)
+        discoverer.open(FILM)
+        self.assertEqual(discoverer.metadata(), qnsmedia.Metadata(
+            "video/mp4", {"TITLE": "Film"}, True, False, 10 * SECOND,
+            (qnsmedia.VideoStream("video/x-h264", "H.264", 640, 360, 24, (25, 1), (1, 1), False,
+                                  800000, 1000000, False),),
+            (qnsmedia.AudioStream("audio/mpeg", "AAC", 2, 48000, 0, 128000, 128000),)))
+        discoverer.image("/srv/film.jpg", width=320, position=3 * SECOND // 2)
+        discoverer.close()
+        self.expect_requests_of_page()
+
+
+class ThePagesImporter(PageTest):
+    PREFIX = "importer "
+    REGISTRATIONS = (7, 8)
+    UNREGISTRATIONS = WITHOUT_ANSWER = (5, 6)
+
+    def test_is_talked_to_as_shown(self):
+        importer = qnsmedia.Importer(self.connection)
+        importer.initialize()
+        importer.import_file(FILM, "Films")
+        importer.cancel()
+        self.expect_requests_of_page()
+
+    def test_tells_its_status_as_shown(self):
+        self.answers = collections.deque(entry for entry in self.answers if entry[0] == 5)
+        importer = qnsmedia.Importer(self.connection)
+        self.assertEqual(importer.status(), qnsmedia.ImporterState(
+            qnsmedia.ImporterStatus.RUNNING, 0, 1000000))
+
+    def test_notifies_as_shown(self):
+        events = Events()
+        qnsmedia.Importer(self.connection, on_notification=events.put)
+        self.notify()
+        event = events.wait_for(qnsmedia.ImporterEvent.STARTED)
+        self.assertEqual(event, qnsmedia.ImporterNotification(
+            qnsmedia.ImporterEvent.STARTED, qnsmedia.Result.SUCCESS, FILM, "H.264", "AAC",
+            640, 360, (25, 1), 48000))
 
 
 if __name__ == "__main__":
