@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include "client/src/ImporterClient.h"
 
+#include <chrono>
 #include <utility>
 
 #include "client/src/ImporterRecords.h"
@@ -26,10 +27,17 @@ constexpr Service kImporter{kImporterAdapterId,
                             number(ImporterMethod::registerNotify),
                             number(ImporterMethod::unregisterNotify)};
 
+/** The same without notifications. */
+constexpr Service kTurns{kImporter.object, kImporter.registerCallBack, kImporter.unregisterCallBack,
+                         kImporter.clientIdCallBack};
+
 constexpr Operation kImport{ImporterMethod::import, ImporterCallBack::import, "import"};
-/** In order, since an answer to an earlier question says nothing of the import. */
 constexpr Operation kTurn{ImporterMethod::getImporterStatus, ImporterCallBack::getImporterStatus,
-                          "import"};
+                          "import", Answers::shared};
+
+/** Both requests that it takes have their own deadlines, which come before this. */
+constexpr Operation kWhole{kImport.method, kImport.answer, kImport.name, Answers::shared,
+                           std::chrono::hours(25)};
 
 bool hasZeroByte(const std::string& text) {
     return text.find('\0') != std::string::npos;
@@ -37,11 +45,13 @@ bool hasZeroByte(const std::string& text) {
 
 } // namespace
 
-ImporterClient::ImporterClient(std::shared_ptr<Link> link)
-    : mService(std::move(link), kImporter,
-               [this](long, long method, const ArgumentReader& arguments) {
-                   notified(method, arguments);
-               }) {}
+ImporterClient::ImporterClient(const std::shared_ptr<Link>& link)
+    : mService(link, kImporter, [this](long, long method, const ArgumentReader& arguments) {
+          notified(method, arguments);
+      }) {
+    for (auto& client : mTurnClients)
+        client.emplace(link, kTurns);
+}
 
 void ImporterClient::importFile(const std::string& path, const std::string& folder,
                                 Completion completion) {
@@ -51,7 +61,7 @@ void ImporterClient::importFile(const std::string& path, const std::string& fold
     PackedArguments arguments = mService.ownId();
     CPack_Simplebuffer().pack_simplebuffer_string(arguments.get(), path);
     CPack_Simplebuffer().pack_simplebuffer_string(arguments.get(), folder);
-    const long ticket = mService.await(kTurn, std::move(completion));
+    const long ticket = mService.await(kWhole, std::move(completion));
     const auto accepted = [this, ticket](std::exception_ptr error, ArgumentReader* answer) {
         try {
             if (error)
@@ -67,14 +77,20 @@ void ImporterClient::importFile(const std::string& path, const std::string& fold
 
 /** The daemon works off imports and questions in order: an answer means that it was our turn. */
 void ImporterClient::awaitTurn(long ticket) {
-    PackedArguments arguments = mService.ownId();
-    const auto told = [this, ticket](std::exception_ptr error, ArgumentReader* answer) {
-        if (error)
-            mService.fail(ticket, error);
-        else
-            mService.finish(ticket, *answer);
+    const std::size_t missed = mTurnsMissed;
+    const ServiceClient& client = *mTurnClients[missed % mTurnClients.size()];
+    PackedArguments arguments = client.ownId();
+    const auto told = [=, &client](std::exception_ptr error, ArgumentReader* answer) {
+        if (!error)
+            return client.finish(ticket, *answer);
+        skipTurnClient(missed);
+        client.fail(ticket, error);
     };
-    mService.send(kTurn, arguments, {told});
+    client.send(kTurn, arguments, {told});
+}
+
+void ImporterClient::skipTurnClient(std::size_t used) {
+    mTurnsMissed.compare_exchange_strong(used, used + 1);
 }
 
 void ImporterClient::notified(long method, ArgumentReader arguments) {
