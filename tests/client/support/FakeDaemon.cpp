@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include "tests/client/support/FakeDaemon.h"
 
+#include <algorithm>
 #include <array>
 #include <netinet/in.h>
 #include <netinet/tcp.h>
@@ -11,14 +12,14 @@
 
 #include <gtest/gtest.h>
 
+#include "tests/daemon/support/ImporterClient.h"
+
 namespace {
 
 constexpr std::size_t kInt64Size = 9;
 
-/** The callback that answers a request, where that carries a result: the one after it. */
-constexpr long answerTo(long method) {
-    return method + 1;
-}
+/** The callback that gives a client its id, in all services. */
+constexpr long kSetClientId = 1;
 
 qns::UniqueFd connectTo(std::int64_t port) {
     qns::UniqueFd socket(::socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0));
@@ -44,7 +45,38 @@ std::size_t clientId(const wire::Packet& request) {
 
 } // namespace
 
-FakeDaemon::FakeDaemon() : mWakeUp(::eventfd(0, EFD_CLOEXEC)), mListener(listenOn(kDaemonPort)) {
+FakeService FakeService::player() {
+    const wire::Bytes accepted = wire::int32(0);
+    return {
+        62,
+        request::kRegisterCallBack,
+        request::kRegisterNotify,
+        {{request::kInitializePlayer, {callback::kInitializePlayer, accepted}},
+         {request::kOpenPlayer, {callback::kOpenPlayer, accepted}},
+         {request::kClosePlayer, {callback::kClosePlayer, accepted}},
+         {request::kPlay, {callback::kPlay, accepted}},
+         {request::kPause, {callback::kPause, accepted}},
+         {request::kSeek, {callback::kSeek, accepted}},
+         {request::kGetPlayerStatus, {callback::kGetPlayerStatus, encode(PlayerStatus{})}},
+         {request::kSetRepeat, {callback::kSetRepeat, accepted}},
+         {request::kPowerOffMediaPlayer, {callback::kPowerOffMediaPlayer, wire::Bytes(4, '\0')}}}};
+}
+
+FakeService FakeService::importer() {
+    const wire::Bytes accepted = wire::int32(0);
+    return {56,
+            importer::kRegister,
+            importer::kRegisterNotify,
+            {{importer::kInitialize, {importer::kInitializeCallBack, accepted}},
+             {importer::kImport, {importer::kImportCallBack, accepted}},
+             {importer::kCancel, {importer::kCancelCallBack, accepted}},
+             {importer::kGetStatus, {importer::kStatusCallBack, importer::status(0, 0, 0)}}}};
+}
+
+FakeDaemon::FakeDaemon(FakeService service)
+    : mService(std::move(service)),
+      mWakeUp(::eventfd(0, EFD_CLOEXEC)),
+      mListener(listenOn(kDaemonPort)) {
     mThread = std::thread([this] { run(); });
 }
 
@@ -70,10 +102,11 @@ void FakeDaemon::callBack(long callback, const wire::Bytes& payload) {
 
 void FakeDaemon::notify(const wire::Bytes& payload) {
     std::unique_lock lock(mMutex);
-    const auto isThere = [this] { return !mClients.empty() && mClients.back().notifyObject != 0; };
-    EXPECT_TRUE(mChanged.wait_until(lock, patience::deadline(), isThere)) << "No notify object";
-    const Client client = mClients.back();
-    sendTo(client, client.notifyObject, 1, payload);
+    const auto listens = [](const Client& client) { return client.notifyObject != 0; };
+    const auto last = [&] { return std::find_if(mClients.rbegin(), mClients.rend(), listens); };
+    const auto isThere = [&] { return last() != mClients.rend(); };
+    ASSERT_TRUE(mChanged.wait_until(lock, patience::deadline(), isThere)) << "No notify object";
+    sendTo(*last(), last()->notifyObject, 1, payload);
 }
 
 void FakeDaemon::sendBytes(std::string_view bytes) {
@@ -151,7 +184,7 @@ void FakeDaemon::serve(Incoming& incoming) {
 
 void FakeDaemon::handle(const wire::Packet& request) {
     EXPECT_EQ(request.receiver, 8);
-    EXPECT_EQ(request.object, 62);
+    EXPECT_EQ(request.object, mService.object);
     EXPECT_FALSE(request.callback);
     EXPECT_TRUE(request.remote);
     react(request);
@@ -168,16 +201,13 @@ void FakeDaemon::react(const wire::Packet& request) {
             ordered->second(request);
         return;
     }
-    if (request.method == request::kRegisterCallBack)
+    const auto answer = mService.answers.find(request.method);
+    if (request.method == mService.registerCallBack)
         registerCallBack(request);
-    else if (request.method == request::kRegisterNotify)
+    else if (request.method == mService.registerNotify)
         registerNotify(request);
-    else if (request.method == request::kGetPlayerStatus)
-        reply(request, callback::kGetPlayerStatus, encode(PlayerStatus{}));
-    else if (request.method == request::kPowerOffMediaPlayer)
-        reply(request, callback::kPowerOffMediaPlayer, wire::Bytes(4, '\0'));
-    else if (request.method < request::kPowerOffMediaPlayer)
-        reply(request, answerTo(request.method), wire::int32(0));
+    else if (answer != mService.answers.end())
+        reply(request, answer->second.callback, answer->second.payload);
 }
 
 void FakeDaemon::registerCallBack(const wire::Packet& request) {
@@ -188,7 +218,7 @@ void FakeDaemon::registerCallBack(const wire::Packet& request) {
     if (!outgoing || isEnded(outgoing.get()))
         outgoing = connectTo(client.identity);
     mClients.push_back(client);
-    sendTo(client, client.callbackObject, callback::kSetPlayerClientId,
+    sendTo(client, client.callbackObject, kSetClientId,
            wire::int32(static_cast<std::int32_t>(mClients.size())));
 }
 

@@ -14,17 +14,34 @@
 #include "base/UniqueFd.h"
 #include "tests/daemon/support/PlayerClient.h"
 
+/** One of the daemon's services, and what it answers without orders to the contrary. */
+struct FakeService {
+    struct Answer {
+        long callback;
+        wire::Bytes payload;
+    };
+
+    long object;
+    long registerCallBack; ///< method ids
+    long registerNotify;
+    std::map<long, Answer> answers; ///< by the request's method; others have none
+
+    /** They accept every request. */
+    static FakeService player();
+    static FakeService importer();
+};
+
 /**
  * What the client library takes for the daemon: bare sockets and packets written by the test.
- * Without orders to the contrary it gives ids, counting from 1, and accepts every request. Any
- * thread may use it.
+ * It has one service. Without orders to the contrary it gives ids, counting from 1. Any thread may
+ * use it.
  */
 class FakeDaemon {
 public:
     /** Called on the daemon's own thread, which may send. */
     using Reaction = std::function<void(const wire::Packet& request)>;
 
-    FakeDaemon();
+    explicit FakeDaemon(FakeService service = FakeService::player());
     ~FakeDaemon();
     FakeDaemon(const FakeDaemon&) = delete;
     FakeDaemon& operator=(const FakeDaemon&) = delete;
@@ -73,6 +90,7 @@ private:
     void write(std::int64_t identity, std::string_view bytes);
     [[nodiscard]] Client lastClient() const;
 
+    const FakeService mService;
     qns::UniqueFd mWakeUp;
     qns::UniqueFd mListener;
     std::list<Incoming> mIncoming; ///< the thread's own
