@@ -33,6 +33,11 @@ std::vector<std::string> linesOf(const std::string& text) {
     return lines;
 }
 
+void dpkg(const std::string& order) {
+    // Triggers of others: to index all manual pages of the machine takes minutes.
+    outputOf("dpkg --no-triggers " + order);
+}
+
 namespace packages {
 
 namespace {
@@ -54,15 +59,15 @@ const std::vector<std::string>& names() {
 }
 
 void install() {
-    outputOf("dpkg --install " QNS_PACKAGE_FOLDER "/*.deb");
+    dpkg("--install " QNS_PACKAGE_FOLDER "/*.deb");
 }
 
 void remove() {
-    outputOf("dpkg --remove" + all());
+    dpkg("--remove" + all());
 }
 
 void purge() {
-    outputOf("dpkg --purge" + all());
+    dpkg("--purge" + all());
 }
 
 } // namespace packages

@@ -19,6 +19,9 @@ std::string outputOf(const std::string& command);
 
 std::vector<std::string> linesOf(const std::string& text);
 
+/** Installs or removes packages, as the order says. */
+void dpkg(const std::string& order);
+
 /** The packages of this build, and whether they are installed on the machine of the test. */
 namespace packages {
 

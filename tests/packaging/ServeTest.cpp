@@ -87,7 +87,7 @@ class AnotherEngine : public Installed {
 protected:
     /** Gives the place back to ours. */
     void TearDown() override {
-        run("dpkg --purge --force-depends device-engine");
+        dpkg("--purge --force-depends device-engine");
         packages::install();
     }
 
@@ -133,7 +133,7 @@ TEST_F(AnotherEngine, CanStandBeforeTheInstalledOne) {
 
 TEST_F(AnotherEngine, CanBeInstalledInItsPlace) {
     const TestFolder folder;
-    outputOf("dpkg --install " + makePackage(folder));
+    dpkg("--install " + makePackage(folder));
     EXPECT_THAT(run("dpkg --status libmediaplayer-proxy1").output, Not(HasSubstr("ok installed")));
     expectToServe({});
 }
