@@ -198,7 +198,18 @@ void MediaDiscovererService::unregisterCallBack(int iClientID) {
     mIds.resetMediaDiscovererIdList(iClientID);
 }
 
+void MediaDiscovererService::clientEnded(int iClientID) {
+    unregisterClient(iClientID);
+    const int iDiscovererID = mIds.setAside(iClientID);
+    if (iDiscovererID == DiscovererIds::kNone)
+        return;
+    // Behind all that the client has asked for, which the main thread may have to do yet.
+    QMetaObject::invokeMethod(
+        this, [this, iDiscovererID] { mIds.takeBack(iDiscovererID); }, Qt::QueuedConnection);
+}
+
 void MediaDiscovererService::retOpen(int iRet, int iDiscovererID) {
+    const auto held = use();
     const int iClientID = mIds.clientOf(iDiscovererID);
     if (iClientID == DiscovererIds::kNoClient)
         mpMediaDiscovererController->clearOpenFile(iDiscovererID);
@@ -207,11 +218,13 @@ void MediaDiscovererService::retOpen(int iRet, int iDiscovererID) {
 }
 
 void MediaDiscovererService::retMetadata(int iDiscovererID) {
+    const auto held = use();
     if (auto* const callback = callbackOf(mIds.clientOf(iDiscovererID)))
         callback->getMetaDataCallBack(mpMediaDiscovererController->metadata(iDiscovererID));
 }
 
 void MediaDiscovererService::retImage(int iDiscovererID) {
+    const auto held = use();
     if (auto* const callback = callbackOf(mIds.clientOf(iDiscovererID))) {
         writeNotice();
         callback->getImageCallBack(mpMediaDiscovererController->image(iDiscovererID));
@@ -219,6 +232,7 @@ void MediaDiscovererService::retImage(int iDiscovererID) {
 }
 
 void MediaDiscovererService::retSupportedExtensions(int iDiscovererID) {
+    const auto held = use();
     if (auto* const callback = callbackOf(mIds.clientOf(iDiscovererID)))
         callback->getSupportedExtensionsCallBack(
             mpMediaDiscovererController->extensions(iDiscovererID));

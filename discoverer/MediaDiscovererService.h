@@ -56,6 +56,10 @@ public Q_SLOTS:
     void retImage(int iDiscovererID);
     void retSupportedExtensions(int iDiscovererID);
 
+protected:
+    /** The discoverer is the last one to be given away while the client's requests last. */
+    void clientEnded(int iClientID) override;
+
 private:
     struct Request;
     using Signal = void (MediaDiscovererService::*)(int);

@@ -3,7 +3,6 @@
 
 #include "define/DiscovererMethods.h"
 #include "define/ObjectIds.h"
-#include "discoverer/IMediaDiscovererServiceCallBack.h"
 #include "pack/ArgumentReader.h"
 #include "ptc/Event.h"
 #include "ptc/FileNameArgument.h"

@@ -2,13 +2,15 @@
 #pragma once
 
 #include "discoverer/IMediaDiscovererService.h"
+#include "discoverer/IMediaDiscovererServiceCallBack.h"
 #include "ptc/ServiceAdapter.h"
 
 /**
  * Decodes the requests of discoverer clients and calls the service, its target, which it owns. A
  * request that lacks fields is passed on with their defaults.
  */
-class MediaDiscovererServiceAdapter : public PTC::ServiceAdapter<IMediaDiscovererService> {
+class MediaDiscovererServiceAdapter
+    : public PTC::ServiceAdapter<IMediaDiscovererService, IMediaDiscovererServiceCallBack> {
 public:
     using ServiceAdapter::ServiceAdapter;
 

@@ -134,12 +134,14 @@ void MediaImporterService::getImporterStatus(int iClientID) {
 
 void MediaImporterService::retImporterStatus() {
     const auto [iClientID, status] = mpMediaImporterController->statusAnswer();
+    const auto held = use();
     if (auto* const callback = callbackOf(iClientID))
         callback->getImporterStatusCallBack(status);
 }
 
 void MediaImporterService::importNotify() {
     const auto notification = mpMediaImporterController->notification();
+    const auto held = use();
     for (const auto& [iClientID, object] : notifyClients())
         if (auto* const notify = static_cast<IMediaImporterServiceNotify*>(object))
             notify->mediaImporterNotify(notification);

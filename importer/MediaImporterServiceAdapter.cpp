@@ -3,8 +3,6 @@
 
 #include "define/ImporterMethods.h"
 #include "define/ObjectIds.h"
-#include "importer/IMediaImporterServiceCallBack.h"
-#include "importer/IMediaImporterServiceNotify.h"
 #include "pack/ArgumentReader.h"
 #include "ptc/Event.h"
 

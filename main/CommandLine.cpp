@@ -13,6 +13,8 @@ constexpr const char* kHelp =
     "Usage: QNSMediaService [OPTION]...\n"
     "Plays media for other processes of this machine, which reach it at 127.0.0.1:1008.\n"
     "\n"
+    "  --reconnect-clients serve clients that end and start again; without it the service\n"
+    "                      connects to each client identity only once in its life\n"
     "  -h, --help          show this text and exit\n"
     "  --version           show the version and exit\n"
     "\n"
@@ -53,7 +55,14 @@ const QtOption* findQtOption(std::string_view argument) {
 }
 
 CommandLine endWith(int status) {
-    return {status, false};
+    CommandLine result;
+    result.exitStatus = status;
+    return result;
+}
+
+CommandLine endWithText(const char* text) {
+    std::fputs(text, stdout);
+    return endWith(EXIT_SUCCESS);
 }
 
 CommandLine refuse(const char* problem, std::string_view argument) {
@@ -73,13 +82,13 @@ CommandLine readCommandLine(int argc, char** argv) {
     CommandLine result;
     for (int i = 1; i < argc; ++i) {
         const std::string_view argument = argv[i];
-        if (argument == "--help" || argument == "-h") {
-            std::fputs(kHelp, stdout);
-            return endWith(EXIT_SUCCESS);
-        }
-        if (argument == "--version") {
-            std::puts("QNSMediaService " QNS_VERSION);
-            return endWith(EXIT_SUCCESS);
+        if (argument == "--help" || argument == "-h")
+            return endWithText(kHelp);
+        if (argument == "--version")
+            return endWithText("QNSMediaService " QNS_VERSION "\n");
+        if (argument == "--reconnect-clients") {
+            result.reconnectsClients = true;
+            continue;
         }
         const QtOption* option = findQtOption(argument);
         if (option == nullptr)

@@ -9,6 +9,9 @@ struct CommandLine {
 
     /** Whether an option names Qt's window system. */
     bool choosesPlatform = false;
+
+    /** Whether clients that end and start again are to be served. */
+    bool reconnectsClients = false;
 };
 
 /** Qt's own options are left to Qt. Anything that nobody knows ends with status 2. */

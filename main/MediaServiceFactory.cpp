@@ -64,7 +64,10 @@ void myFree(void* memory) {
     std::free(memory);
 }
 
-MediaServiceFactory::MediaServiceFactory() = default;
+MediaServiceFactory::MediaServiceFactory(bool reconnectsClients) {
+    if (reconnectsClients)
+        mEndedClients.emplace();
+}
 
 MediaServiceFactory::~MediaServiceFactory() {
     // Its threads call createProxy(), and its adapters end the services.
@@ -97,6 +100,8 @@ void MediaServiceFactory::addService(long adapterId, Interface*& service) {
     auto adapter = std::make_unique<Adapter>(adapterId);
     adapter->setProxyFactory(this);
     adapter->setTarget(service);
+    if (mEndedClients)
+        mEndedClients->addHolder(*adapter);
     mpThreadedReceiver->addAdapter(adapter.release());
 }
 
@@ -137,13 +142,15 @@ PTC::IProxyBase* MediaServiceFactory::createProxy(long interfaceId, long proxyId
     const ProxyMaker* maker = findProxyMaker(interfaceId);
     if (maker == nullptr)
         return nullptr;
+    if (mEndedClients)
+        mEndedClients->release(mConnections);
     PTC::ISender* sender = senderFor(clientIdentity);
     if (sender == nullptr)
         return nullptr;
     ProxyPointer proxy = maker->make(proxyId);
     proxy->setSender(sender);
     PTC::IProxyBase* result = proxy.get();
-    addProxy(std::move(proxy));
+    addProxy(toModuleId(clientIdentity), std::move(proxy));
     return result;
 }
 

@@ -2,7 +2,9 @@
 #pragma once
 
 #include <memory>
+#include <optional>
 
+#include "ptc/EndedClients.h"
 #include "ptc/InstanceFactory.h"
 
 class IMediaDiscovererService;
@@ -17,10 +19,13 @@ void myFree(void* memory);
 /**
  * Builds the whole serving side at start-up, and makes the proxies through which services talk
  * back to clients. initialize() runs on the main thread, createProxy() on the receiver's worker.
+ *
+ * A client module has one sender for the factory's whole life, unless clients may reconnect:
+ * then each registration of a client first clears up after those that have ended.
  */
 class MediaServiceFactory : public PTC::InstanceFactory {
 public:
-    MediaServiceFactory();
+    explicit MediaServiceFactory(bool reconnectsClients = false);
     ~MediaServiceFactory() override;
 
     /**
@@ -45,7 +50,8 @@ public:
     /**
      * A proxy of interface `interfaceId` for object `proxyId` of the client at port
      * `clientIdentity`, connecting to the client when its module has no sender yet. Null for an
-     * unknown interface, and when the client cannot be reached. The factory owns the proxy.
+     * unknown interface, and when the client cannot be reached. The factory owns the proxy: to
+     * its end, or to that of a client that may reconnect.
      */
     PTC::IProxyBase* createProxy(long interfaceId, long proxyId, long clientIdentity) override;
 
@@ -62,4 +68,6 @@ private:
     IMediaPlayerService* mpPlayerService = nullptr;
     LTReceiver* mpThreadedReceiver = nullptr;   ///< owned by one of the next two
     std::unique_ptr<LTReceiver> mpIdleReceiver; ///< while no server runs
+
+    std::optional<PTC::EndedClients> mEndedClients; ///< only where clients may reconnect
 };

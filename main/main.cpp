@@ -23,7 +23,7 @@ int main(int argc, char** argv) {
 
     // Destroyed in the opposite order.
     const QApplication application(argc, argv);
-    MediaServiceFactory factory;
+    MediaServiceFactory factory(commandLine.reconnectsClients);
     factory.initialize(); // without a server the process runs all the same; the server has said so
     MediaServiceMain serviceMain;
     if (!serviceMain.initialize()) {

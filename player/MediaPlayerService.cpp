@@ -146,6 +146,7 @@ void MediaPlayerService::getPlayerStatus(int iClientID) {
 
 void MediaPlayerService::retPlayerStatus() {
     const auto [iClientID, status] = mpMediaPlayerController->statusAnswer();
+    const auto held = use();
     if (auto* const callback = callbackOf(iClientID))
         callback->getPlayerStatusCallBack(status);
 }
@@ -200,6 +201,7 @@ void MediaPlayerService::setSystemFormat(MediaServiceDefine::_emMediaServiceSyst
 void MediaPlayerService::openNotify() {
     qns::printLine("MediaPlayerService::openNotify");
     const auto& notification = mpMediaPlayerController->notification();
+    const auto held = use();
     for (const auto& [iClientID, object] : notifyClients()) {
         qns::printFormatted("####### LOOP(%d)\n", iClientID);
         if (auto* const notify = static_cast<IMediaPlayerServiceNotify*>(object))

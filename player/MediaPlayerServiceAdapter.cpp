@@ -4,8 +4,6 @@
 #include "define/ObjectIds.h"
 #include "define/PlayerMethods.h"
 #include "pack/ArgumentReader.h"
-#include "player/IMediaPlayerServiceCallBack.h"
-#include "player/IMediaPlayerServiceNotify.h"
 #include "ptc/Event.h"
 #include "ptc/FileNameArgument.h"
 

@@ -1,6 +1,19 @@
 // SPDX-License-Identifier: MIT
 #include "ptc/ClientNotify.h"
 
+#include <algorithm>
+#include <optional>
+
+namespace {
+
+std::optional<int> idOf(const void* object, const std::map<int, void*>& objects) {
+    const auto entry = std::find_if(objects.begin(), objects.end(),
+                                    [object](const auto& known) { return known.second == object; });
+    return entry == objects.end() ? std::nullopt : std::optional(entry->first);
+}
+
+} // namespace
+
 ClientNotify::~ClientNotify() = default;
 
 int ClientNotify::getNewID() {
@@ -43,4 +56,28 @@ void* ClientNotify::getCurrentMethod(int id) const {
 std::map<int, void*> ClientNotify::notifyClients() const {
     const std::lock_guard<std::mutex> lock(mMutex);
     return mNotifyMap;
+}
+
+void ClientNotify::forget(const void* object) {
+    std::unique_lock<std::mutex> lock(mMutex);
+    const auto client = idOf(object, mClientMap);
+    const auto notify = idOf(object, mNotifyMap);
+    lock.unlock();
+    if (client)
+        clientEnded(*client);
+    if (notify)
+        unregisterNotifyClient(*notify);
+}
+
+void ClientNotify::clientEnded(int id) {
+    unregisterClient(id);
+}
+
+bool ClientNotify::isInUse() const {
+    const std::unique_lock<std::shared_mutex> free(mUseMutex, std::try_to_lock);
+    return !free.owns_lock();
+}
+
+std::shared_lock<std::shared_mutex> ClientNotify::use() const {
+    return std::shared_lock<std::shared_mutex>(mUseMutex);
 }

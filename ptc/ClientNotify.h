@@ -3,10 +3,15 @@
 
 #include <map>
 #include <mutex>
+#include <shared_mutex>
 
 /**
  * A service's registry of clients: hands out client ids and remembers each client's callback
  * object and notify object. The objects are not owned. Any thread may call it.
+ *
+ * An object may be freed after forget(), unless isInUse(). So a thread that does not call
+ * forget() itself holds what use() returns from before it looks an object up until it has
+ * used it.
  */
 class ClientNotify {
 public:
@@ -31,7 +36,19 @@ public:
     /** The callback object of `id`, or null. */
     [[nodiscard]] void* getCurrentMethod(int id) const;
 
+    /** Unregisters the object, a callback or a notify object, wherever it is registered. */
+    void forget(const void* object);
+
+    /** False when nobody uses an object that he looked up before this call. Does not wait. */
+    [[nodiscard]] bool isInUse() const;
+
 protected:
+    /** Not twice at a time on one thread. */
+    [[nodiscard]] std::shared_lock<std::shared_mutex> use() const;
+
+    /** Unregisters the callback object of a client that has ended. */
+    virtual void clientEnded(int id);
+
     /** A copy of the notify objects by ascending client id, to be called without the lock. */
     [[nodiscard]] std::map<int, void*> notifyClients() const;
 
@@ -40,4 +57,6 @@ private:
     std::map<int, void*> mClientMap;
     std::map<int, void*> mNotifyMap;
     int mLastID = 0;
+
+    mutable std::shared_mutex mUseMutex; ///< held, shared, by those who use an object
 };

@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: MIT
 #include "ptc/InstanceFactory.h"
 
-#include "ptc/IProxy.h"
 #include "ptc/IRemoteReceiver.h"
-#include "ptc/ISender.h"
+
+#include <utility>
 
 namespace PTC {
 
@@ -11,8 +11,7 @@ InstanceFactory::InstanceFactory() = default;
 
 InstanceFactory::~InstanceFactory() {
     mpRemoteReceiver.reset();
-    mProxies.clear();
-    mSenders.clear();
+    mConnections.clear();
 }
 
 bool InstanceFactory::initialize() {
@@ -24,16 +23,18 @@ long InstanceFactory::getRRIdentity() {
 }
 
 ISender* InstanceFactory::findSender(long moduleId) const {
-    const auto sender = mSenders.find(moduleId);
-    return sender == mSenders.end() ? nullptr : sender->second.get();
+    const auto connection = mConnections.find(moduleId);
+    return connection == mConnections.end() ? nullptr : connection->second.pSender.get();
 }
 
 void InstanceFactory::addSender(ISender* sender) {
-    mSenders.try_emplace(sender->getId(), sender);
+    auto& kept = mConnections[sender->getId()].pSender;
+    if (kept == nullptr)
+        kept.reset(sender);
 }
 
-void InstanceFactory::addProxy(std::unique_ptr<IProxyBase> proxy) {
-    mProxies.push_back(std::move(proxy));
+void InstanceFactory::addProxy(long moduleId, std::unique_ptr<IProxyBase> proxy) {
+    mConnections[moduleId].proxies.push_back(std::move(proxy));
 }
 
 } // namespace PTC

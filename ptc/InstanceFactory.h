@@ -1,16 +1,14 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include "ptc/ClientConnection.h"
 #include "ptc/IFactory.h"
 
-#include <map>
 #include <memory>
-#include <vector>
 
 namespace PTC {
 
 class IRemoteReceiver;
-class ISender;
 
 /**
  * Base of a process's object factory. Owns the remote receiver, the proxies and one sender per
@@ -37,14 +35,11 @@ public:
     void addSender(ISender* sender);
 
 protected:
-    /** Keeps the proxy until the factory ends. */
-    void addProxy(std::unique_ptr<IProxyBase> proxy);
+    /** Keeps the proxy as long as the sender of that module. */
+    void addProxy(long moduleId, std::unique_ptr<IProxyBase> proxy);
 
     std::unique_ptr<IRemoteReceiver> mpRemoteReceiver;
-
-private:
-    std::vector<std::unique_ptr<IProxyBase>> mProxies;
-    std::map<long, std::unique_ptr<ISender>> mSenders;
+    ClientConnections mConnections;
 };
 
 } // namespace PTC

@@ -3,8 +3,10 @@
 
 #include "pack/ArgumentReader.h"
 #include "ptc/Adapter.h"
+#include "ptc/ClientNotify.h"
 #include "ptc/Event.h"
 #include "ptc/IProxy.h"
+#include "ptc/IProxyHolder.h"
 #include "ptc/Registration.h"
 
 #include <algorithm>
@@ -37,15 +39,22 @@ struct OperationParameter<void (Service::*)(Parameter)> {
  *         dispatch(kMethods, *event);
  *     }
  *
- * Owns its target. Called by one thread at a time: the one that dispatches events.
+ * Owns its target. Called by one thread at a time: the one that dispatches events. `Objects` are
+ * the interfaces of the objects that clients register with the service.
  */
-template<typename Service>
-class ServiceAdapter : public Adapter {
+template<typename Service, typename... Objects>
+class ServiceAdapter : public Adapter, public IProxyHolder {
 public:
     using Adapter::Adapter;
 
     /** Takes over `target`, which must have been converted from a `Service*`. */
     void setTarget(void* target) override { mpTarget.reset(static_cast<Service*>(target)); }
+
+    /** Always false for the objects of a service that is no ClientNotify: nobody knows its users.
+     */
+    [[nodiscard]] bool letGo([[maybe_unused]] IProxyBase& proxy) override {
+        return (letGoOf(dynamic_cast<Objects*>(&proxy)) && ...);
+    }
 
 protected:
     using Handler = void (*)(ServiceAdapter& adapter, Event& event);
@@ -115,6 +124,17 @@ protected:
 private:
     template<auto operation>
     using ParameterOf = typename OperationParameter<decltype(operation)>::Type;
+
+    template<typename Object>
+    bool letGoOf(Object* object) const {
+        if (object == nullptr)
+            return true;
+        auto* const registry = dynamic_cast<ClientNotify*>(target());
+        if (registry == nullptr)
+            return false;
+        registry->forget(object);
+        return !registry->isInUse();
+    }
 
     template<typename Number>
     static void readOne(Number& number, ArgumentReader& reader) {

@@ -167,6 +167,11 @@ bool SocketRemoteSender::writePacket() {
     return true;
 }
 
+bool SocketRemoteSender::hasEnded() const {
+    pollfd watched{clientSocket.get(), POLLRDHUP, 0};
+    return ::poll(&watched, 1, 0) > 0;
+}
+
 void SocketRemoteSender::giveUp() {
     mGivenUp = true;
     ::shutdown(clientSocket.get(), SHUT_RDWR);

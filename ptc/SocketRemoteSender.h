@@ -31,6 +31,12 @@ public:
 
     void send(PTC::Event* event) override;
 
+    /** Whether the peer has closed its end, or was given up. Does not wait. */
+    [[nodiscard]] bool hasEnded() const;
+
+    /** From now on all is dropped. Does not wait; interrupts a thread that sends. */
+    void giveUp();
+
     /** The connected socket, borrowed, to be watched for the peer's end; -1 before. */
     [[nodiscard]] int socket() const { return clientSocket.get(); }
 
@@ -38,7 +44,6 @@ private:
     void fillPacket(const PTC::Event& event);
     bool drainAcknowledgements();
     [[nodiscard]] bool writePacket();
-    void giveUp();
 
     qns::UniqueFd clientSocket;
     std::atomic<bool> mGivenUp{false}; ///< read before locking: nobody queues up for a lost peer

@@ -62,6 +62,11 @@ public:
         return mProxies.back().get();
     }
 
+    /** The proxy of the client with this id. */
+    PTC::IProxyBase& proxyOf(int clientId) {
+        return *mProxies.at(static_cast<std::size_t>(clientId) - 1);
+    }
+
 private:
     PTC::ISender& mSender;
     std::vector<std::unique_ptr<PTC::CallbackProxy>> mProxies;

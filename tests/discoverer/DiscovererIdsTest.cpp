@@ -58,6 +58,41 @@ TEST_F(TenClients, FreeTheLowestFirst) {
     EXPECT_EQ(mIds.getMediaDiscovererId(12), 7);
 }
 
+TEST_F(TenClients, AreGivenWhatIsSetAsideOnlyWhenNothingElseIsFree) {
+    EXPECT_EQ(mIds.setAside(3), 2);
+    EXPECT_EQ(mIds.clientOf(2), DiscovererIds::kNoClient);
+    EXPECT_EQ(mIds.getMediaDiscovererId(3), DiscovererIds::kNone);
+    mIds.resetMediaDiscovererIdList(8);
+    mIds.setMediaDiscovererIdList(11);
+    mIds.setMediaDiscovererIdList(12);
+    EXPECT_EQ(mIds.getMediaDiscovererId(11), 7);
+    EXPECT_EQ(mIds.getMediaDiscovererId(12), 2);
+}
+
+TEST_F(TenClients, AreGivenWhatWasTakenBackInItsOrder) {
+    mIds.setAside(3);
+    mIds.resetMediaDiscovererIdList(8);
+    mIds.takeBack(2);
+    mIds.setMediaDiscovererIdList(11);
+    EXPECT_EQ(mIds.getMediaDiscovererId(11), 2);
+}
+
+TEST_F(TenClients, MaySetOneAsideAgainBeforeItIsTakenBack) {
+    mIds.setAside(3);
+    mIds.setMediaDiscovererIdList(11);
+    mIds.setAside(11);
+    mIds.takeBack(2);
+    mIds.resetMediaDiscovererIdList(8);
+    mIds.setMediaDiscovererIdList(12);
+    EXPECT_EQ(mIds.getMediaDiscovererId(12), 7) << "the other one is still set aside once";
+}
+
+TEST_F(TenClients, SetNothingAsideForOneThatHasNone) {
+    for (const int client : {0, -1, 11})
+        EXPECT_EQ(mIds.setAside(client), DiscovererIds::kNone);
+    EXPECT_EQ(mIds.clientOf(0), 1);
+}
+
 TEST_F(TenClients, AreLeftAloneByTheEndOfOneThatHasNone) {
     for (const int client : {0, -1, 11, 77})
         mIds.resetMediaDiscovererIdList(client);

@@ -294,6 +294,43 @@ TEST_F(DiscovererService, ResultsOfAClientThatHasLeftAreSentToNobody) {
     EXPECT_FALSE(mFolder.has("notice"));
 }
 
+TEST_F(DiscovererService, GivesTheDiscovererOfAClientThatEndedAwayAfterWhatItHadAskedFor) {
+    requestFromWorker(kGetExtensions, int32(1));
+    EXPECT_TRUE(mAdapter->letGo(mProxies.proxyOf(1)));
+    registerClient();
+    forget();
+    requestFromWorker(kGetExtensions, int32(2));
+    EXPECT_CALL(engine(0), supportedExtensions(_));
+    EXPECT_CALL(engine(1), supportedExtensions(_));
+    runQueued();
+    EXPECT_THAT(mSender.take(), ElementsAre(SentEvent{101, 7, kNoExtensions}));
+    registerClient();
+    forget();
+    EXPECT_CALL(engine(0), supportedExtensions(_));
+    EXPECT_THAT(answersTo(kGetExtensions, int32(3)), SizeIs(1));
+}
+
+TEST_F(DiscovererService, GivesTheDiscoverersOfTenClientsThatEndedAwayAtOnce) {
+    registerAllOthers();
+    for (int client = 1; client <= kDiscovererCount; ++client)
+        EXPECT_TRUE(mAdapter->letGo(mProxies.proxyOf(client)));
+    registerClient();
+    forget();
+    EXPECT_CALL(engine(0), supportedExtensions(_));
+    EXPECT_THAT(answersTo(kGetExtensions, int32(11)), SizeIs(1));
+    runQueued();
+    EXPECT_THAT(answersTo(kInitialize, int32(11)), ElementsAre(SentEvent{110, 2, int32(0)}));
+}
+
+TEST_F(DiscovererService, LetsGoOfAClientWithoutADiscoverer) {
+    registerAllOthers();
+    registerClient();
+    EXPECT_TRUE(mAdapter->letGo(mProxies.proxyOf(11)));
+    forget();
+    runQueued();
+    EXPECT_THAT(answersTo(kInitialize, int32(11)), IsEmpty());
+}
+
 TEST_F(DiscovererService, AnswersInitializeAndCloseBeforeTheyAreDone) {
     requestFromWorker(kClose, int32(1));
     EXPECT_THAT(mSender.take(), ElementsAre(SentEvent{100, 4, int32(0)}));

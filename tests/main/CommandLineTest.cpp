@@ -30,6 +30,14 @@ TEST(CommandLine, WithoutOptionsStartsTheService) {
     EXPECT_EQ(readCommandLine(0, nullptr).exitStatus, std::nullopt);
 }
 
+TEST(CommandLine, ClientsMayReconnectOnlyWhenAskedFor) {
+    EXPECT_FALSE(read({"-platform", "offscreen"}).reconnectsClients);
+    const CommandLine result = read({"--reconnect-clients", "-platform", "offscreen"});
+    EXPECT_TRUE(result.reconnectsClients);
+    EXPECT_TRUE(result.choosesPlatform);
+    EXPECT_EQ(result.exitStatus, std::nullopt);
+}
+
 TEST(CommandLine, HelpIsPrintedAndThatIsAll) {
     for (const char* option : {"--help", "-h"}) {
         CaptureStdout();

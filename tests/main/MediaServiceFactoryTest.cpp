@@ -68,6 +68,12 @@ private:
 
 class Factory : public ::testing::Test {
 protected:
+    /** Another process at the same port. */
+    static void restart(std::unique_ptr<ClientPort>& client, int port) {
+        client.reset();
+        client = std::make_unique<ClientPort>(port);
+    }
+
     MediaServiceFactory mFactory;
 };
 
@@ -114,6 +120,32 @@ TEST_F(Factory, StoresNoSenderForAClientThatCannotBeReached) {
     EXPECT_EQ(mFactory.findSender(4), nullptr);
     ClientPort client(1003);
     EXPECT_NE(mFactory.createProxy(kPlayerCallBackId, 1, 1003), nullptr);
+}
+
+TEST_F(Factory, KeepsTheSenderOfAClientThatHasEnded) {
+    auto client = std::make_unique<ClientPort>(1000);
+    ASSERT_NE(mFactory.createProxy(kPlayerCallBackId, 5, 1000), nullptr);
+    PTC::ISender* const sender = mFactory.findSender(1);
+    EXPECT_EQ(client->connections(), 1);
+    restart(client, 1000);
+    EXPECT_NE(mFactory.createProxy(kPlayerCallBackId, 5, 1000), nullptr);
+    EXPECT_EQ(mFactory.findSender(1), sender);
+    EXPECT_EQ(client->connections(), 0);
+}
+
+TEST_F(Factory, ReplacesTheSenderOfAClientThatHasEndedWhereAskedFor) {
+    MediaServiceFactory factory(true);
+    auto client = std::make_unique<ClientPort>(1000);
+    ClientPort other(1001);
+    ASSERT_NE(factory.createProxy(kPlayerCallBackId, 5, 1000), nullptr);
+    ASSERT_NE(factory.createProxy(kPlayerCallBackId, 5, 1001), nullptr);
+    EXPECT_EQ(other.connections(), 1);
+    restart(client, 1000);
+    EXPECT_NE(factory.createProxy(kPlayerCallBackId, 5, 1000), nullptr);
+    EXPECT_EQ(client->connections(), 1);
+    EXPECT_NE(factory.createProxy(kPlayerNotifyId, 6, 1000), nullptr);
+    EXPECT_NE(factory.createProxy(kPlayerNotifyId, 6, 1001), nullptr);
+    EXPECT_EQ(client->connections() + other.connections(), 0);
 }
 
 TEST_F(Factory, MakesTheProxyOfTheInterface) {

@@ -3,6 +3,7 @@
 
 #include <gtest/gtest.h>
 
+#include <future>
 #include <set>
 #include <thread>
 #include <vector>
@@ -12,6 +13,7 @@ namespace {
 class Registry : public ClientNotify {
 public:
     using ClientNotify::notifyClients;
+    using ClientNotify::use;
 };
 
 } // namespace
@@ -85,6 +87,51 @@ TEST(ClientNotify, KeepsTheNotifyObjectOfAClientThatUnregistersItsCallback) {
     registry.registerNotifyClient(other, &notify);
     registry.unregisterNotifyClient(other);
     EXPECT_TRUE(registry.isEnableID(other));
+}
+
+TEST(ClientNotify, ForgetsAnObjectWhereverItIsRegistered) {
+    Registry registry;
+    int callback = 0;
+    int notify = 0;
+    int other = 0;
+    const int id = registry.registerClient(&callback);
+    const int otherId = registry.registerClient(&other);
+    registry.registerNotifyClient(7, &notify);
+    registry.forget(&callback);
+    EXPECT_FALSE(registry.isEnableID(id));
+    EXPECT_EQ(registry.notifyClients().count(7), 1u);
+    registry.forget(&notify);
+    EXPECT_EQ(registry.notifyClients().count(7), 0u);
+    EXPECT_TRUE(registry.isEnableID(otherId));
+}
+
+TEST(ClientNotify, ForgetsAnUnknownObjectWithoutHarm) {
+    Registry registry;
+    int callback = 0;
+    int other = 0;
+    const int id = registry.registerClient(&callback);
+    registry.forget(&other);
+    EXPECT_TRUE(registry.isEnableID(id));
+    EXPECT_EQ(registry.registerClient(&other), 2);
+}
+
+TEST(ClientNotify, IsInUseAsLongAsAnyThreadUsesIt) {
+    Registry registry;
+    EXPECT_FALSE(registry.isInUse());
+    std::promise<void> inUse;
+    std::promise<void> enough;
+    std::thread user([&] {
+        const auto held = registry.use();
+        inUse.set_value();
+        enough.get_future().wait();
+    });
+    inUse.get_future().wait();
+    EXPECT_TRUE(registry.isInUse());
+    std::thread([&registry] { EXPECT_TRUE(registry.use().owns_lock()); }).join();
+    EXPECT_TRUE(registry.isInUse());
+    enough.set_value();
+    user.join();
+    EXPECT_FALSE(registry.isInUse());
 }
 
 TEST(ClientNotify, GivesIdsToManyThreadsWithoutRepeatingOne) {

@@ -96,7 +96,7 @@ TEST(InstanceFactory, DestroysWhatSendsBeforeWhatItSendsThrough) {
     {
         Factory factory;
         factory.addSender(new Sender(1, &journal));
-        factory.addProxy(std::make_unique<Proxy>(journal));
+        factory.addProxy(1, std::make_unique<Proxy>(journal));
         factory.mpRemoteReceiver = std::make_unique<Remote>(journal);
     }
     EXPECT_EQ(journal, (Journal{"receiver", "proxy", "sender"}));

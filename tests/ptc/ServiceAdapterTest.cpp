@@ -13,6 +13,7 @@
 #include <cstring>
 #include <memory>
 #include <string>
+#include <thread>
 #include <vector>
 
 using testing::Mock;
@@ -81,7 +82,7 @@ public:
 
 enum class MethodId : long { play = 1, open = 2 };
 
-class ExampleAdapter : public PTC::ServiceAdapter<IService> {
+class ExampleAdapter : public PTC::ServiceAdapter<IService, ICallBack, INotify> {
 public:
     using ServiceAdapter::ServiceAdapter;
     void receive(PTC::Event* event) override {
@@ -259,6 +260,63 @@ TEST_F(ServiceAdapter, TakesARegistrationWithoutABlock) {
         mAdapter->receive(&event);
         Mock::VerifyAndClearExpectations(&mFactory);
     }
+}
+
+TEST_F(ServiceAdapter, LetsGoOfWhatIsNotItsServicesAndOfNothingElse) {
+    PTC::CallbackProxy foreign(9, true);
+    EXPECT_TRUE(mAdapter->letGo(foreign));
+    EXPECT_FALSE(mAdapter->letGo(mCallBack)) << "the service tells nobody whether it uses it";
+    EXPECT_FALSE(mAdapter->letGo(mNotify));
+}
+
+namespace {
+
+/** A service with a registry of its clients. */
+class RegisteringService : public IService, public ClientNotify {
+public:
+    void play(int) override {}
+    void open(Name) override {}
+    void setFormat(Format) override {}
+    void registerCallBack(ICallBack* callback) override { registerClient(callback); }
+    void registerNotify(Listener listener) override {
+        registerNotifyClient(listener.iClientID, listener.pNotify);
+    }
+    using ClientNotify::notifyClients;
+    using ClientNotify::use;
+};
+
+class RegisteringAdapter : public testing::Test {
+protected:
+    RegisteringAdapter() {
+        mAdapter.setTarget(static_cast<IService*>(mpService));
+        mpService->registerCallBack(&mCallBack);
+        mpService->registerNotify({&mNotify, 1});
+    }
+
+    CallBackProxy mCallBack;
+    NotifyProxy mNotify;
+    RegisteringService* mpService = new RegisteringService; ///< owned by the adapter
+    ExampleAdapter mAdapter{62};
+};
+
+} // namespace
+
+TEST_F(RegisteringAdapter, LetsGoOfEachProxyAlone) {
+    EXPECT_TRUE(mAdapter.letGo(mNotify));
+    EXPECT_TRUE(mpService->notifyClients().empty());
+    EXPECT_TRUE(mpService->isEnableID(1));
+    EXPECT_TRUE(mAdapter.letGo(mCallBack));
+    EXPECT_FALSE(mpService->isEnableID(1));
+    EXPECT_TRUE(mAdapter.letGo(mCallBack)) << "for the second time";
+}
+
+TEST_F(RegisteringAdapter, AsksForPatienceWhileAThreadMayUseTheProxy) {
+    std::thread([this] {
+        const auto held = mpService->use();
+        std::thread([this] { EXPECT_FALSE(mAdapter.letGo(mCallBack)); }).join();
+    }).join();
+    EXPECT_FALSE(mpService->isEnableID(1)) << "unregistered at once";
+    EXPECT_TRUE(mAdapter.letGo(mCallBack));
 }
 
 TEST(CallbackReply, SendsANumberInIts32BitForm) {

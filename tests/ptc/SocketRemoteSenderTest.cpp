@@ -25,6 +25,7 @@
 #include <map>
 #include <netinet/in.h>
 #include <netinet/tcp.h>
+#include <poll.h>
 #include <string>
 #include <sys/ioctl.h>
 #include <sys/socket.h>
@@ -61,6 +62,12 @@ int unreadBytes(int socket) {
     int count = 0;
     ioctl(socket, FIONREAD, &count);
     return count;
+}
+
+/** Whether a thread that sends must wait. */
+bool isFull(int socket) {
+    pollfd source{socket, POLLOUT, 0};
+    return ::poll(&source, 1, 0) == 0;
 }
 
 template<typename Call>
@@ -210,6 +217,25 @@ TEST_F(SocketSender, LosesNothingThatWasSentBeforeItsEnd) {
     EXPECT_EQ(::recv(peer.socket(), &byte, 1, 0), 0) << "an end in order, and no reset";
 }
 
+TEST_F(SocketSender, KnowsWhetherItsPeerHasEnded) {
+    send(mSender, 1, "unread");
+    ASSERT_TRUE(mPeer.write("OK"));
+    EXPECT_FALSE(mSender.hasEnded());
+    mPeer = Peer(-1);
+    EXPECT_TRUE(eventually([this] { return mSender.hasEnded(); }));
+    EXPECT_FALSE(SocketRemoteSender(kModule).hasEnded()) << "it has not begun";
+}
+
+TEST_F(SocketSender, GivenUpSendsNothingAndIsAtItsEnd) {
+    send(mSender, 1, "before");
+    mSender.giveUp();
+    EXPECT_TRUE(mSender.hasEnded());
+    send(mSender, 2, "after");
+    const auto bytes = mPeer.readAll();
+    ASSERT_EQ(bytes.size(), PTC::kPacketSize);
+    EXPECT_EQ(payloadOf(bytes), "before");
+}
+
 TEST_F(SocketSender, SetsItsConnectionUp) {
     int noDelay = 0;
     int bufferSize = 0;
@@ -246,6 +272,25 @@ TEST_F(DeafPeer, IsGivenUpAfterTwoSeconds) {
     EXPECT_LT(timeOf([this] {
                   for (int packet = 0; packet < 1000; ++packet)
                       send(mSender, 1, "x");
+              }),
+              1s);
+}
+
+TEST_F(DeafPeer, IsAtItsEndOnceGivenUp) {
+    EXPECT_FALSE(mSender.hasEnded());
+    sendUntilGivenUp();
+    EXPECT_TRUE(mSender.hasEnded());
+}
+
+TEST_F(DeafPeer, GivenUpInTheMiddleOfAPacketFreesTheThreadThatSendsIt) {
+    auto sending = std::async(std::launch::async, [this] {
+        while (!mSender.hasEnded())
+            send(mSender, 1, "x");
+    });
+    EXPECT_TRUE(eventually([this] { return isFull(mSender.socket()); }));
+    EXPECT_LT(timeOf([&] {
+                  mSender.giveUp();
+                  sending.wait();
               }),
               1s);
 }
