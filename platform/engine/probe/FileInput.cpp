@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include "probe/FileInput.h"
 
+#include <algorithm>
 #include <cerrno>
 #include <cstdio>
 #include <unistd.h>
@@ -54,6 +55,14 @@ int FileInput::read(std::uint8_t* buffer, int size) {
     mOffset += count;
     mBytesLeft -= count;
     return static_cast<int>(count);
+}
+
+std::size_t FileInput::readAt(std::int64_t place, char* buffer, std::size_t size) {
+    if (isExhausted())
+        return 0;
+    const ssize_t count = ::pread(mFile.get(), buffer, size, static_cast<off_t>(place));
+    mBytesLeft -= std::max<ssize_t>(count, 0);
+    return static_cast<std::size_t>(std::max<ssize_t>(count, 0));
 }
 
 std::int64_t FileInput::seek(std::int64_t offset, int whence) {

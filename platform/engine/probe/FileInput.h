@@ -27,6 +27,10 @@ public:
     [[nodiscard]] struct stat status() const;                 ///< all zero when it fails
     [[nodiscard]] bool isExhausted() const;
 
+    /** Reads beside the context, which stays where it is; returns how many bytes, less at the end.
+     */
+    std::size_t readAt(std::int64_t place, char* buffer, std::size_t size);
+
 private:
     static int readBytes(void* input, std::uint8_t* buffer, int size);
     static std::int64_t seekTo(void* input, std::int64_t offset, int whence);

@@ -12,6 +12,7 @@
 #include "base/UniqueFd.h"
 #include "probe/Duration.h"
 #include "probe/Formats.h"
+#include "probe/Fragments.h"
 #include "probe/PictureHeader.h"
 #include "probe/Signature.h"
 
@@ -130,6 +131,16 @@ bool isDisguised(AVIOContext& input) {
                        [&](std::string_view mark) { return sound.find(mark) != sound.npos; });
 }
 
+/** An AVI file that was never finished, or of which the end is missing: its header is wrong. */
+bool isCutOff(AVIOContext& input) {
+    constexpr std::int64_t kLengthAt = 4;
+    const std::int64_t place = avio_tell(&input);
+    avio_seek(&input, kLengthAt, SEEK_SET);
+    const std::int64_t end = kLengthAt + 4 + static_cast<std::int64_t>(avio_rl32(&input));
+    avio_seek(&input, place, SEEK_SET);
+    return end > avio_size(&input);
+}
+
 } // namespace
 
 MediaFile::MediaFile(qns::UniqueFd file, std::int64_t size, Bounds bounds)
@@ -191,9 +202,11 @@ int MediaFile::openInput() {
     context->pb = mInput.context();
     context->interrupt_callback = {isInterrupted, &mInput};
     context->probesize = 1024 * 1024;
+    context->skip_estimate_duration_from_pts = 1; // it is exact only for films
     const int error = avformat_open_input(&context, nullptr, mpFormat, nullptr);
     mContext = FormatContext(kAdopt, context);
-    if (error >= 0 && mContext->duration <= 0 && isToldByHeader(*mContext.get()))
+    mCutOff = error >= 0 && formatName() == "avi" && isCutOff(*mContext->pb);
+    if (error >= 0 && mContext->duration <= 0 && !mCutOff && isToldByHeader(*mContext.get()))
         mContext->duration = durationOfStreams(*mContext.get());
     return error;
 }
@@ -203,7 +216,8 @@ bool MediaFile::isClear() const {
     if (isPicture())
         return mReadPicture;
     return mContext->nb_streams > 0 && (mContext->ctx_flags & AVFMTCTX_NOHEADER) == 0 &&
-           mContext->duration > 0 && !(formatName() == "wav" && isDisguised(*mContext->pb));
+           (mContext->duration > 0 || isBareSound(formatName())) &&
+           !(formatName() == "wav" && isDisguised(*mContext->pb));
 }
 
 bool MediaFile::isPicture() const {
@@ -221,8 +235,9 @@ void MediaFile::analyse() {
         mContext->duration = told;
 }
 
-bool MediaFile::isEstimate() const {
-    return mContext->duration <= 0 ||
+bool MediaFile::isEstimate() {
+    return mContext->duration <= 0 || mCutOff ||
+           (formatName().substr(0, 4) == "mov," && hasFragments(mInput)) ||
            (mAnalysed && mContext->duration_estimation_method == AVFMT_DURATION_FROM_BITRATE);
 }
 
@@ -235,10 +250,10 @@ const MediaFile::Duration& MediaFile::duration() {
             mAnalysed && mContext->duration_estimation_method == AVFMT_DURATION_FROM_PTS;
         return mDuration;
     }
-    const auto counted = countDuration(*mContext.get());
-    if (mInput.isExhausted() || counted == std::chrono::nanoseconds::zero())
+    const CountedDuration counted = countDuration(*mContext.get(), mInput);
+    if (counted.time.count() == 0 || (counted.isExact && mInput.isExhausted()))
         return mDuration;
-    return mDuration = {counted, true};
+    return mDuration = {counted.time, counted.isExact};
 }
 
 bool isVideo(const AVStream& stream) {

@@ -82,7 +82,7 @@ private:
     bool findFormat();
     [[nodiscard]] int openInput();
     [[nodiscard]] bool isClear() const;
-    [[nodiscard]] bool isEstimate() const;
+    [[nodiscard]] bool isEstimate();
 
     static int isInterrupted(void* input) {
         return static_cast<FileInput*>(input)->isExhausted() ? 1 : 0;
@@ -92,6 +92,7 @@ private:
     const AVInputFormat* mpFormat = nullptr;
     bool mTagged = false;
     bool mReadPicture = false; ///< its header has told all there is to know
+    bool mCutOff = false;      ///< what the header says of the duration is wrong
     bool mAnalysed = false;
     bool mDurationKnown = false;
     Duration mDuration;
