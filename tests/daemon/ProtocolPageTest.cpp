@@ -8,10 +8,9 @@
 #include <vector>
 
 #include "tests/daemon/support/DaemonTest.h"
+#include "tests/daemon/support/PageEngine.h"
 #include "tests/daemon/support/ProtocolPage.h"
-#include "tests/engine_double/MetadataText.h"
 
-using testing::StartsWith;
 using wire::Bytes;
 
 namespace {
@@ -21,18 +20,6 @@ std::wstring widened(const std::string& text) {
     std::wstring wide(text.size(), L'\0');
     wide.resize(std::mbstowcs(wide.data(), text.c_str(), wide.size()));
     return wide;
-}
-
-/** What the page's engine tells of the page's film. */
-LibMediaPlayer::MediaMetaInfo film() {
-    LibMediaPlayer::MediaMetaInfo info;
-    info.system = {"video/mp4", L"TITLE=Film\n", true, false, 10'000'000'000};
-    info.videoCount = 1;
-    info.video = {"video/x-h264", L"H.264", 640,       360,  24, 25, 1, 1, 1,
-                  false,          800'000,  1'000'000, false};
-    info.audioCount = 1;
-    info.audio[0] = {"audio/mpeg", L"AAC", 2, 48'000, 0, 128'000, 128'000};
-    return info;
 }
 
 /** The numbers that the page's client gives its objects, and where the service is. */
@@ -50,23 +37,15 @@ const std::map<std::string, Service> kServices{
 };
 
 constexpr std::size_t kAddressOffset = 24;
-constexpr int kDiscoverers = 11;
 
 /** The page's client, and a daemon whose whole engine does what the page tells. */
 class ProtocolPage : public DaemonTest {
 protected:
     void SetUp() override {
         auto options = withEngineDouble();
-        options.environment["QNS_ENGINE_DOUBLE"] = mPlayer.address();
-        options.environment["QNS_DISCOVERER_DOUBLE"] = mDiscoverers.address();
-        options.environment["QNS_IMPORTER_DOUBLE"] = mImporter.address();
+        mEngine.addTo(options);
         start(options);
-        for (int number = 0; number < kDiscoverers; ++number) {
-            if (number == kDiscoverers - 1)
-                mImporter.expectCall("importer create");
-            mDiscoverers.expectCall("discoverer " + std::to_string(number) + " create");
-        }
-        mPlayer.expectCall("player create null 15");
+        mEngine.expectCreation();
         ASSERT_TRUE(mpDaemon->waitUntilServing()) << mpDaemon->output().joined();
         mClient.connect();
     }
@@ -113,7 +92,7 @@ protected:
             event.uvalue1 = static_cast<unsigned long>(number);
         else
             event.value = number;
-        mPlayer.notify(event);
+        mEngine.player().notify(event);
         const auto packet = mClient.receive();
         return packet ? itemOf(kind, packet->payload) : Bytes();
     }
@@ -121,93 +100,15 @@ protected:
     PlayerClient mClient{1000};
 
 private:
-    /** A call of the engine, how it begins, and what the engine answers. */
-    struct Call {
-        EngineScript& script;
-        std::string beginning;
-        std::string answer = "return 0";
-    };
-
     void sendRequest(const PageBlock& block) {
         mClient.send(
             {8, kServices.at(block.service).object, block.method, false, true, block.bytes()});
-        for (const auto& [script, beginning, answer] : callsFor(block)) {
-            EXPECT_THAT(script.nextCall(), StartsWith(beginning));
-            script.answer(answer);
-        }
-    }
-
-    std::vector<Call> callsFor(const PageBlock& block) {
-        if (block.service == "discoverer")
-            return discovererCalls(block.method);
-        return block.service == "importer" ? importerCalls(block.method)
-                                           : playerCalls(block.method);
-    }
-
-    std::vector<Call> playerCalls(long method) {
-        switch (method) {
-        case request::kInitializePlayer:
-            return {{mPlayer, "player open \"/"}, {mPlayer, "player close"}};
-        case request::kOpenPlayer:
-            mOpen = true;
-            return {{mPlayer, "player open \"/media/film.mp4\" 2"}};
-        case request::kClosePlayer:
-            mOpen = false;
-            return {{mPlayer, "player close"}};
-        case request::kPlay:
-            return {{mPlayer, "player play"}};
-        case request::kPause:
-            return {{mPlayer, "player pause"}};
-        case request::kSeek:
-            return {{mPlayer, "player seek 1500000000 0"}};
-        case request::kSetRepeat:
-            return {{mPlayer, "player repeat true 1000000000 2000000000"}};
-        case request::kPowerOffMediaPlayer:
-            return {{mPlayer, "player destroy"}};
-        default:
-            if (method == request::kGetPlayerStatus && mOpen)
-                return {{mPlayer, "player status", "return 3 1500000000 10000000000"}};
-            return {};
-        }
-    }
-
-    std::vector<Call> discovererCalls(long method) {
-        switch (method) {
-        case 2:
-            return {{mDiscoverers, "discoverer 0 open \"/media/film.mp4\""}};
-        case 3:
-            return {{mDiscoverers, "discoverer 0 close"}};
-        case 4:
-            return {{mDiscoverers, "discoverer 0 metadata", script::metadataAnswer(0, film())}};
-        case 5:
-            return {{mDiscoverers, "discoverer 0 metadata", script::metadataAnswer(0, film())},
-                    {mDiscoverers, "discoverer 0 makeImage 1500000000 320 0 \"/srv/film.jpg\""}};
-        case 6:
-            return {{mDiscoverers, "discoverer 0 extensions", "return 0 \"mkv,mp4\" 2"}};
-        default:
-            return {};
-        }
-    }
-
-    std::vector<Call> importerCalls(long method) {
-        switch (method) {
-        case 2:
-            return {{mDiscoverers, "discoverer 10 open \"/media/film.mp4\""},
-                    {mDiscoverers, "discoverer 10 metadata", script::metadataAnswer(0, film())},
-                    {mDiscoverers, "discoverer 10 close"},
-                    {mImporter, "importer import \"/media/film.mp4\" \"Films\""}};
-        case 3:
-            return {{mImporter, "importer cancel"}};
-        case 4:
-            return {{mImporter, "importer status", "return 1 0 1000000"}};
-        default:
-            return {};
-        }
+        mEngine.carryOut(block);
     }
 
     void expectPacket(const PageBlock& block) {
         if (block.title == "packet notification")
-            mPlayer.notify({3, 0, L"", 0, 0, 0, 0, 0, 10'000'000'000});
+            mEngine.notify(block);
         auto packet = mClient.receiveBytes();
         const auto expected = block.packet();
         ASSERT_EQ(packet.size(), expected.size());
@@ -220,10 +121,7 @@ private:
     }
 
     void expectNotification(const PageBlock& block) {
-        if (block.service == "importer")
-            mImporter.notifyImport({3, 0, L"/media/film.mp4"});
-        else
-            mPlayer.notify({1, 0, L"/media/film.mp4", 1, 2, 0, 1, 0, 10'000'000'000});
+        mEngine.notify(block);
         expectArguments(block, kServices.at(block.service).notifyObject, 1);
     }
 
@@ -239,10 +137,7 @@ private:
         return payload.substr(before, payload.size() - before - after);
     }
 
-    EngineScript mPlayer;
-    EngineScript mDiscoverers;
-    EngineScript mImporter;
-    bool mOpen = false;
+    PageEngine mEngine;
 };
 
 TEST_F(ProtocolPage, ShowsAConversationAsItIs) {
@@ -260,7 +155,7 @@ TEST_F(ProtocolPage, ShowsAConversationAsItIs) {
     EXPECT_EQ(kinds["acknowledgement"], 1);
 }
 
-TEST_F(ProtocolPage, ShowsEveryRequestOfEveryService) {
+TEST(ProtocolPageText, ShowsEveryRequestOfEveryService) {
     std::map<std::string, std::set<long>> requests;
     for (const auto& block : blocksOfPage()) {
         if (block.kind == "request")
