@@ -134,6 +134,23 @@ class ARequest(PeerTest):
         self.arguments[7] = PLAYING
         self.assertEqual(player.status(), qnsmedia.PlayerState(3, 5, 7))
 
+    def test_is_answered_by_callbacks_alone(self):
+        player = qnsmedia.Player(self.connect())
+        refused = qnsmedia.encode(1)
+        senseless = bytearray(Packet(1, self.object, 5, True, refused).to_bytes())
+        senseless[40:48] = (2 ** 40).to_bytes(8, "little")
+        others = [senseless, Packet(1, self.object, 5, False, refused).to_bytes(),
+                  Packet(1, self.object + 1, 5, True, refused).to_bytes()]
+
+        def answer_last(packet):
+            if packet.method == 4:
+                for other in others:
+                    self.peer.send(other)
+            return self.answer(packet)
+
+        self.peer.answer = answer_last
+        player.play()
+
     def test_survives_answers_that_nobody_waits_for(self):
         player = qnsmedia.Player(self.connect())
         surplus = [Packet(1, target, method, callback, ACCEPTED)
@@ -176,12 +193,6 @@ class Packets(PeerTest):
             return ()
 
         self.peer.answer = in_pieces
-        player.play()
-
-    def test_without_sense_are_dropped(self):
-        player = qnsmedia.Player(self.connect())
-        header = Packet(1, self.object, 5, True, ACCEPTED).to_bytes()
-        self.peer.send(header[:40] + (2 ** 40).to_bytes(8, "little") + header[48:])
         player.play()
 
 
