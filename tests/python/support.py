@@ -46,12 +46,15 @@ def wait_until_it_listens(process):
 class DaemonTest(unittest.TestCase):
     """A test with the daemon, which must have ended by itself or by a signal with status 0."""
 
+    OPTIONS = ()
+
     def setUp(self):
         self.data = temporary_folder(self)
         self.log = open(os.path.join(self.data, "daemon.log"), "w+b")
         self.addCleanup(self.log.close)
         self.daemon = subprocess.Popen(
-            ["setpriv", "--pdeathsig", "KILL", "--", os.environ["QNS_DAEMON"]],
+            ["setpriv", "--pdeathsig", "KILL", "--", os.environ["QNS_DAEMON"],
+             *self.OPTIONS],
             stdout=self.log, stderr=subprocess.STDOUT,
             env={**os.environ, "QNS_HV_DATA": self.data})
         self.addCleanup(self.end_daemon)

@@ -191,6 +191,25 @@ class OneClient(DaemonTest):
                              PlayerStatus.NOT_READY)
 
 
+class AClientThatRestarts(DaemonTest):
+    OPTIONS = ("--reconnect-clients",)
+
+    def test_is_served_under_the_same_identity(self):
+        for _ in range(3):
+            with qnsmedia.Connection(1000, PATIENCE) as connection:
+                discoverer = qnsmedia.Discoverer(connection)
+                discoverer.open(film)
+                self.assertEqual(discoverer.metadata().media_type, "video/mp4")
+
+    def test_is_told_of_what_another_life_began(self):
+        with qnsmedia.Connection(1000, PATIENCE) as connection:
+            qnsmedia.Player(connection).open(film)
+        events = Events()
+        player = qnsmedia.Player(self.connect(1000), on_notification=events.put)
+        player.play()
+        events.wait_for(PlayerEvent.END)
+
+
 class TheCommandLine(DaemonTest):
     def run_tool(self, identity, *arguments, status=0):
         done = subprocess.run(
