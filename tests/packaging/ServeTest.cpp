@@ -1,8 +1,13 @@
 // SPDX-License-Identifier: MIT
 #include <filesystem>
 #include <fstream>
+#include <future>
+#include <mutex>
+
+#include <qnsmedia/Importer.h>
 
 #include "tests/daemon/support/DaemonProcess.h"
+#include "tests/daemon/support/Patience.h"
 #include "tests/daemon/support/PlayerClient.h"
 #include "tests/daemon/support/SampleMedia.h"
 #include "tests/engine_double/EngineScript.h"
@@ -23,6 +28,7 @@ constexpr const char* kConfine = "/usr/local/bin/confine";
 class Service : public Installed {
 protected:
     void SetUp() override {
+        std::filesystem::remove_all("/var/lib/qnsmedia"); // what another daemon has left
         // Where the daemon's user can reach it.
         outputOf(std::string("install -m 755 " QNS_CONFINE " ") + kConfine);
         outputOf("install -m 644 " + sample::film() + " /srv/film.mp4");
@@ -61,6 +67,24 @@ TEST_F(Service, WritesNowhereElse) {
     outputOf("install -d -m 777 /srv/all");
     EXPECT_NE(run("qnsmedia image /srv/film.mp4 -o /srv/all/film.jpg").status, 0);
     EXPECT_FALSE(std::filesystem::exists("/srv/all/film.jpg"));
+}
+
+TEST_F(Service, ImportsIntoItsLibrary) {
+    qnsmedia::Connection connection;
+    qnsmedia::Importer importer(connection);
+    std::promise<qnsmedia::ImportNotification> finished;
+    std::once_flag once; // the last event may be told more than once
+    importer.onNotification([&](const qnsmedia::ImportNotification& notification) {
+        if (notification.kind == qnsmedia::ImportNotificationKind::finished)
+            std::call_once(once, [&] { finished.set_value(notification); });
+    });
+    importer.importFile("/srv/film.mp4", "Films").get();
+    auto future = finished.get_future();
+    ASSERT_EQ(future.wait_until(patience::deadline()), std::future_status::ready);
+    const qnsmedia::ImportNotification imported = future.get();
+    EXPECT_EQ(imported.result, 0) << imported.text;
+    EXPECT_TRUE(std::filesystem::exists("/var/lib/qnsmedia/media/Films/film.mp4"))
+        << imported.text << outputOf("find /var/lib/qnsmedia");
 }
 
 TEST_F(Service, RemembersGStreamersPlugins) {
