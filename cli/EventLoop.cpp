@@ -4,7 +4,6 @@
 #include <atomic>
 #include <cerrno>
 #include <csignal>
-#include <poll.h>
 #include <sys/eventfd.h>
 #include <system_error>
 #include <unistd.h>
@@ -66,8 +65,8 @@ int EventLoop::takeSignal() {
     return gSignal.exchange(0);
 }
 
-bool EventLoop::wait(std::chrono::milliseconds time, int input) {
-    pollfd watched[] = {{mWakeUp, POLLIN, 0}, {input, POLLIN, 0}};
+bool EventLoop::wait(std::chrono::milliseconds time, int input, short events) {
+    pollfd watched[] = {{mWakeUp, POLLIN, 0}, {input, events, 0}};
     const int ready = ::poll(watched, 2, static_cast<int>(time.count()));
     eventfd_t count = 0;
     ::eventfd_read(mWakeUp, &count);

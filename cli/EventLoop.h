@@ -4,6 +4,7 @@
 #include <chrono>
 #include <functional>
 #include <mutex>
+#include <poll.h>
 #include <vector>
 
 /**
@@ -31,9 +32,10 @@ public:
 
     /**
      * Waits for at most that long until there is something to do, and runs the tasks. Returns
-     * whether the descriptor `input`, if it is not -1, has something to read or has ended.
+     * whether the descriptor `input`, if it is not -1, has something to read or has ended, or
+     * is ready for the other `events` of poll(2) that are given.
      */
-    bool wait(std::chrono::milliseconds time, int input = -1);
+    bool wait(std::chrono::milliseconds time, int input = -1, short events = POLLIN);
 
 private:
     std::vector<Task> takeTasks();

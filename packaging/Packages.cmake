@@ -60,6 +60,10 @@ qns_package(tool qnsmedia video "command-line tool of the media service"
     "Plays, describes and imports media through the daemon."
     DEPENDS "libqnsmediaclient1 (>= ${PROJECT_VERSION})"
     RECOMMENDS "qnsmediaservice")
+qns_package(desktop qnsmedia-mpris video "shows the media service's player on the desktop"
+    "Lets desktops, media keys and playerctl control what the daemon plays."
+    DEPENDS "libqnsmediaclient1 (>= ${PROJECT_VERSION})"
+    RECOMMENDS "qnsmediaservice")
 
 # Nothing is installed that no package contains.
 get_cmake_property(components COMPONENTS)

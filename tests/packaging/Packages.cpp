@@ -57,9 +57,9 @@ std::string all() {
 } // namespace
 
 const std::vector<std::string>& names() {
-    static const std::vector<std::string> kNames = {"libqnsys1",       "libmediaplayer-proxy1",
-                                                    "qnsmediaservice", "libqnsmediaclient1",
-                                                    "qnsmedia",        "libqnsmedia-dev"};
+    static const std::vector<std::string> kNames = {
+        "libqnsys1", "libmediaplayer-proxy1", "qnsmediaservice", "libqnsmediaclient1",
+        "qnsmedia",  "libqnsmedia-dev",       "qnsmedia-mpris"};
     return kNames;
 }
 
