@@ -85,15 +85,17 @@ class TheToolsPage(unittest.TestCase):
         self.assertEqual(named - real, set())
 
 
-class TheDaemonsPage(unittest.TestCase):
-    def test_names_every_option(self):
-        options = tool_help.options_of(tool_help.DAEMON)
-        self.assertIn("--version", options)
-        text = shown(page("QNSMediaService.8"))
-        self.assertEqual(options - tool_help.options_in(text), set())
+class TheOtherProgramsPages(unittest.TestCase):
+    def test_name_every_option(self):
+        for program, manual in ((tool_help.DAEMON, "QNSMediaService.8"),
+                                (tool_help.MPRIS, "qnsmedia-mpris.1")):
+            with self.subTest(manual):
+                options = tool_help.options_of(program)
+                self.assertIn("--version", options)
+                self.assertEqual(options - tool_help.options_in(shown(page(manual))), set())
 
 
-QNS_PAGES = ["qnsmedia.1", "qnsmedia-library.5", "qnsmedia-protocol.7", "QNSMediaService.8"]
+QNS_PAGES = ["qnsmedia-mpris.1", "qnsmedia.1", "qnsmedia-library.5", "qnsmedia-protocol.7", "QNSMediaService.8"]
 
 if __name__ == "__main__":
     unittest.main()

@@ -7,6 +7,7 @@ import subprocess
 
 TOOL = os.environ["QNS_TOOL"]
 DAEMON = os.environ["QNS_DAEMON"]
+MPRIS = os.environ["QNS_MPRIS"]
 
 
 def help_of(program, *command):
