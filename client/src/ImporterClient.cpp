@@ -27,17 +27,14 @@ constexpr Service kImporter{kImporterAdapterId,
                             number(ImporterMethod::registerNotify),
                             number(ImporterMethod::unregisterNotify)};
 
-/** The same without notifications. */
-constexpr Service kTurns{kImporter.object, kImporter.registerCallBack, kImporter.unregisterCallBack,
-                         kImporter.clientIdCallBack};
-
 constexpr Operation kImport{ImporterMethod::import, ImporterCallBack::import, "import"};
+/** Not shared, since an answer to an earlier question says nothing of the import. */
 constexpr Operation kTurn{ImporterMethod::getImporterStatus, ImporterCallBack::getImporterStatus,
-                          "import", Answers::shared};
+                          "import", Answers::mayBeLost};
 
-/** Both requests that it takes have their own deadlines, which come before this. */
-constexpr Operation kWhole{kImport.method, kImport.answer, kImport.name, Answers::shared,
-                           std::chrono::hours(25)};
+/** Its two requests have deadlines of their own, which come before this. */
+constexpr Operation kWhole{ImporterMethod::import, ImporterCallBack::import, "import",
+                           Answers::shared, std::chrono::hours(25)};
 
 bool hasZeroByte(const std::string& text) {
     return text.find('\0') != std::string::npos;
@@ -45,13 +42,11 @@ bool hasZeroByte(const std::string& text) {
 
 } // namespace
 
-ImporterClient::ImporterClient(const std::shared_ptr<Link>& link)
-    : mService(link, kImporter, [this](long, long method, const ArgumentReader& arguments) {
-          notified(method, arguments);
-      }) {
-    for (auto& client : mTurnClients)
-        client.emplace(link, kTurns);
-}
+ImporterClient::ImporterClient(std::shared_ptr<Link> link)
+    : mService(std::move(link), kImporter,
+               [this](long, long method, const ArgumentReader& arguments) {
+                   notified(method, arguments);
+               }) {}
 
 void ImporterClient::importFile(const std::string& path, const std::string& folder,
                                 Completion completion) {
@@ -77,20 +72,14 @@ void ImporterClient::importFile(const std::string& path, const std::string& fold
 
 /** The daemon works off imports and questions in order: an answer means that it was our turn. */
 void ImporterClient::awaitTurn(long ticket) {
-    const std::size_t missed = mTurnsMissed;
-    const ServiceClient& client = *mTurnClients[missed % mTurnClients.size()];
-    PackedArguments arguments = client.ownId();
-    const auto told = [=, &client](std::exception_ptr error, ArgumentReader* answer) {
-        if (!error)
-            return client.finish(ticket, *answer);
-        skipTurnClient(missed);
-        client.fail(ticket, error);
+    PackedArguments arguments = mService.ownId();
+    const auto told = [this, ticket](std::exception_ptr error, ArgumentReader* answer) {
+        if (error)
+            mService.fail(ticket, error);
+        else
+            mService.finish(ticket, *answer);
     };
-    client.send(kTurn, arguments, {told});
-}
-
-void ImporterClient::skipTurnClient(std::size_t used) {
-    mTurnsMissed.compare_exchange_strong(used, used + 1);
+    mService.send(kTurn, arguments, {told});
 }
 
 void ImporterClient::notified(long method, ArgumentReader arguments) {

@@ -139,11 +139,16 @@ void Link::request(const Request& request, PackedArguments& arguments, Completio
     if (arguments.size() > static_cast<uint64_t>(PTC::kMaxPayloadSize))
         return fail(request.replyObject, std::move(completion),
                     failure<Error>(request.what + ": the text is too long for a request"));
-    if (await(request, std::move(completion)) != 0)
+    const auto [ticket, isServed] = add(request, std::move(completion));
+    if (ticket != 0 && !isServed)
         post(request.service, request.method, arguments);
 }
 
 long Link::await(const Request& request, Completion completion) {
+    return add(request, std::move(completion)).ticket;
+}
+
+PendingRequests::Added Link::add(const Request& request, Completion completion) {
     PendingRequest pending;
     pending.object = request.replyObject;
     pending.method = request.replyMethod;
@@ -151,12 +156,12 @@ long Link::await(const Request& request, Completion completion) {
     pending.deadline = Clock::now() + mDeadline + request.extraTime;
     pending.what = request.what;
     pending.completion = std::move(completion);
-    const long ticket = mPending.add(pending);
-    if (ticket != 0)
+    const auto added = mPending.add(pending);
+    if (added.ticket != 0)
         wakeWatcher();
     else
         fail(request.replyObject, std::move(pending.completion), lost(request.what));
-    return ticket;
+    return added;
 }
 
 void Link::post(long service, long method, PackedArguments& arguments) {

@@ -88,6 +88,7 @@ public:
     }
 
 private:
+    PendingRequests::Added add(const Request& request, Completion completion);
     void takeIdentity(const Connection::Options& options);
     bool startServer(int identity);
     void connectToDaemon();

@@ -18,13 +18,19 @@ PendingRequests::List PendingRequests::takeWhere(Matches matches) {
     return taken;
 }
 
-long PendingRequests::add(PendingRequest& request) {
+PendingRequests::Added PendingRequests::add(PendingRequest& request) {
+    const auto servesIt = [&](const PendingRequest& other) {
+        return other.object == request.object && other.method == request.method &&
+               other.answers == Answers::mayBeLost;
+    };
     const std::lock_guard lock(mMutex);
     if (mClosed)
-        return 0;
+        return {};
+    const bool isServed = request.answers == Answers::shared &&
+                          std::any_of(mWaiting.begin(), mWaiting.end(), servesIt);
     request.ticket = ++mLastTicket;
     mWaiting.push_back(std::move(request));
-    return mLastTicket;
+    return {mLastTicket, isServed};
 }
 
 PendingRequests::List PendingRequests::takeAnswered(long object, long method) {

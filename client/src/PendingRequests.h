@@ -17,8 +17,9 @@ using Clock = std::chrono::steady_clock;
 
 /** Which answers belong to a kind of request. */
 enum class Answers {
-    inOrder, ///< one each, in the order of the requests
-    shared   ///< one answer serves all that wait: it tells how things are now
+    inOrder,   ///< one each, in the order of the requests
+    mayBeLost, ///< the same, but one that is overdue may as well have gone to another client
+    shared     ///< one answer serves all that wait: it tells how things are now
 };
 
 /** Who is told of a request's outcome. */
@@ -45,8 +46,12 @@ class PendingRequests {
 public:
     using List = std::list<PendingRequest>;
 
-    /** Takes the request and gives its ticket; 0 when closed, and then `request` is as it was. */
-    long add(PendingRequest& request);
+    struct Added {
+        long ticket = 0;       ///< 0 when closed, and then the request is as it was
+        bool isServed = false; ///< shares another's answer that is to come, so need not be sent
+    };
+
+    Added add(PendingRequest& request);
 
     /**
      * Takes what an answer completes. An answer that comes too late still uses up its own

@@ -57,7 +57,8 @@ public:
      * `folder` is empty. Ready when the daemon's engine has taken the import into its queue or
      * has refused it, which a notification tells. Wait for that before the next import: the
      * daemon has room for one that is on its way, and a second one takes its place. TimedOut
-     * may also mean that another client got the answer, as with status().
+     * may also mean that another client got the answer, as with status(). The import after one may
+     * be ready too early, with an answer that was only late.
      */
     std::future<void> importFile(const std::string& path, const std::string& folder = {});
     void importFile(const std::string& path, const std::string& folder, Callback callback);
