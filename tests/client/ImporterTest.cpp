@@ -334,30 +334,37 @@ TEST_F(ClientImporter, ImportsAgainAfterTheWordOfATurnWentToAnother) {
     }
 }
 
-TEST_F(ClientImporter, DoesNotTakeALateWordOfATurnForTheNextOnes) {
-    connect(shortDeadline());
+TEST_F(ClientImporter, DoesNotTakeTheAnswerToAnEarlierQuestionForItsTurn) {
     mDaemon.on(importer::kGetStatus, nullptr);
-    EXPECT_THROW(mImporter->importFile("/a").get(), qnsmedia::TimedOut);
-    const auto late = mDaemon.waitForRequest(importer::kGetStatus);
-    ASSERT_TRUE(late);
-    mDaemon.on(importer::kGetStatus, [&](const wire::Packet&) {
-        mDaemon.reply(*late, importer::kStatusCallBack, importer::status(1, 0, 0));
-    });
-    EXPECT_THROW(mImporter->importFile("/b").get(), qnsmedia::TimedOut);
-}
-
-TEST_F(ClientImporter, DoesNotTakeAStatusForItsTurn) {
-    mDaemon.on(importer::kGetStatus, nullptr);
-    auto imported = mImporter->importFile("/a");
-    const auto turn = mDaemon.waitForRequest(importer::kGetStatus);
     auto status = mImporter->status();
     const auto question = mDaemon.waitForRequest(importer::kGetStatus);
-    ASSERT_TRUE(turn && question);
+    auto imported = mImporter->importFile("/a");
+    const auto turn = mDaemon.waitForRequest(importer::kGetStatus);
+    ASSERT_TRUE(question && turn);
     mDaemon.reply(*question, importer::kStatusCallBack, importer::status(1, 2, 3));
     EXPECT_EQ(status.get().bytesDone, 2);
     EXPECT_FALSE(isReady(imported));
     mDaemon.reply(*turn, importer::kStatusCallBack, importer::status(1, 2, 3));
     EXPECT_NO_THROW(imported.get());
+}
+
+TEST_F(ClientImporter, AsksForItsTurnAndTheStatusOnlyOnceAtATime) {
+    mDaemon.on(importer::kGetStatus, nullptr);
+    auto imported = mImporter->importFile("/a");
+    const auto turn = mDaemon.waitForRequest(importer::kGetStatus);
+    ASSERT_TRUE(turn);
+    auto first = mImporter->status();
+    auto second = mImporter->status();
+    mImporter->cancel().get();
+    mDaemon.reply(*turn, importer::kStatusCallBack, importer::status(1, 2, 3));
+    EXPECT_NO_THROW(imported.get());
+    EXPECT_EQ(first.get().bytesDone, 2);
+    EXPECT_EQ(second.get().bytesDone, 2);
+    answerStatus(importer::status(0, 9, 9));
+    EXPECT_EQ(mImporter->status().get().bytesDone, 9);
+    EXPECT_TRUE(mDaemon.waitForRequest(importer::kGetStatus));
+    mImporter->initialize().get();
+    EXPECT_FALSE(mDaemon.hasRequest(importer::kGetStatus));
 }
 
 } // namespace

@@ -135,6 +135,12 @@ std::optional<wire::Packet> FakeDaemon::waitForRequest(long method) {
     return found;
 }
 
+bool FakeDaemon::hasRequest(long method) const {
+    const std::lock_guard lock(mMutex);
+    return std::any_of(mRequests.begin(), mRequests.end(),
+                       [=](const wire::Packet& request) { return request.method == method; });
+}
+
 void FakeDaemon::die() {
     {
         const std::lock_guard lock(mMutex);

@@ -66,6 +66,9 @@ public:
     /** Waits for the next request with this method; those before it are dropped. */
     std::optional<wire::Packet> waitForRequest(long method);
 
+    /** True when there has been one that waitForRequest() has not given or dropped. */
+    [[nodiscard]] bool hasRequest(long method) const;
+
     /** Ends all connections and listens no more, as a process that dies. */
     void die();
 
