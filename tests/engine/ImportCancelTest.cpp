@@ -119,5 +119,5 @@ TEST(ImportEnd, DropsWhatIsQueuedWithoutAnAnswer) {
     const auto notifications = importer.notifications();
     EXPECT_LE(std::count_if(notifications.begin(), notifications.end(),
                             [](const auto& told) { return told.kind == kImportFinished; }),
-              32);
+              128);
 }

@@ -38,10 +38,16 @@ struct Attempt {
     int frameBudget;
 };
 
+/** What files say can be anything; where they say nothing, it is a few seconds. */
+nanoseconds lengthOf(const MediaFile& file) {
+    constexpr std::chrono::microseconds kLongest = std::chrono::hours(1000);
+    const std::chrono::microseconds told(file.context().duration);
+    return told.count() > 0 ? std::min(told, kLongest) : seconds(10);
+}
+
 /** Key frames are cheap. Where only the first one is there, and dark, one has to be decoded to. */
 std::array<Attempt, 4> attemptsFor(const MediaFile& file) {
-    const nanoseconds told = std::chrono::microseconds(file.context().duration);
-    const nanoseconds length = told > nanoseconds::zero() ? told : seconds(10);
+    const nanoseconds length = lengthOf(file);
     return {{{std::min<nanoseconds>(length / 10, seconds(10)), kKeyFrameBudget},
              {length / 4, kKeyFrameBudget},
              {length / 2, kKeyFrameBudget},

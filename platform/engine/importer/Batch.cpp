@@ -18,7 +18,7 @@ using namespace LibMediaPlayer;
 
 namespace {
 
-constexpr std::size_t kMostItems = 32;
+constexpr std::size_t kMostItems = 128;
 constexpr std::chrono::milliseconds kLongest{250};
 
 /** A copy that takes so long that nobody should wait for it. */

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include "importer/Importer.h"
 
+#include <chrono>
 #include <optional>
 #include <sys/stat.h>
 #include <utility>
@@ -17,6 +18,9 @@ namespace importer {
 using namespace LibMediaPlayer;
 
 namespace {
+
+/** Who imports many files asks for one after another: the next comes within this, as a rule. */
+constexpr std::chrono::milliseconds kLinger{3};
 
 std::int64_t sizeOf(const std::wstring& text) {
     struct stat status {};
@@ -79,7 +83,7 @@ void Importer::runBatch(Job first) {
     Batch batch(mOptions, mQueue, mOutlet, mCatalogue);
     batch.add(std::move(first));
     const auto hasRoom = [&](const Job& job) { return batch.hasRoomFor(job); };
-    while (auto job = mQueue.takeIf(hasRoom))
+    while (auto job = mQueue.takeIf(hasRoom, kLinger))
         batch.add(*std::move(job));
     batch.finish();
 }

@@ -64,11 +64,13 @@ std::size_t JobQueue::waitingCount() const {
 }
 
 std::optional<Job> JobQueue::take() {
-    return takeIf([](const Job&) { return true; });
+    return takeIf([](const Job&) { return true; }, std::chrono::milliseconds(0));
 }
 
-std::optional<Job> JobQueue::takeIf(const std::function<bool(const Job&)>& suits) {
-    const std::lock_guard lock(mMutex);
+std::optional<Job> JobQueue::takeIf(const std::function<bool(const Job&)>& suits,
+                                    std::chrono::milliseconds patience) {
+    std::unique_lock lock(mMutex);
+    mChanged.wait_for(lock, patience, [this] { return mClosed || !mWaiting.empty(); });
     if (mClosed || mWaiting.empty() || !suits(mWaiting.front()))
         return std::nullopt;
     Job job = std::move(mWaiting.front());

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <chrono>
 #include <condition_variable>
 #include <cstdint>
 #include <deque>
@@ -44,8 +45,9 @@ public:
 
     /** The worker's side. */
     std::optional<Job> take();
-    /** The next job when there is one and it suits. */
-    std::optional<Job> takeIf(const std::function<bool(const Job&)>& suits);
+    /** The next job if it suits; waits so long for there to be one. */
+    std::optional<Job> takeIf(const std::function<bool(const Job&)>& suits,
+                              std::chrono::milliseconds patience);
     /** Until there is a job to take, somebody has called wake(), or the queue is closed. */
     void wait();
     [[nodiscard]] bool isClosed() const;

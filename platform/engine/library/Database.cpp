@@ -23,8 +23,11 @@ constexpr int kBusyMilliseconds = 2000;
 constexpr int kThumbnailTries = 3;
 
 enum Query : std::size_t {
-    kPutMedia,
-    kDropChangedThumbnail,
+    kFindMedia,
+    kAddMedia,
+    kChangeMedia,
+    kIndexMedia,
+    kDropThumbnail,
     kDropVideo,
     kDropAudio,
     kDropTags,
@@ -43,17 +46,21 @@ enum Query : std::size_t {
 };
 
 constexpr std::array<const char*, kQueryCount> kQueries = {
-    // kPutMedia
+    // kFindMedia
+    "SELECT id, size, modified FROM media WHERE path = ?1",
+    // kAddMedia
     "INSERT INTO media (path, source, size, modified, imported, media_type, duration, seekable,"
     " title, artist, album, thumbnail_tries)"
-    " VALUES (?1, ?2, ?3, ?4, ?5, ?6, ?7, ?8, ?9, ?10, ?11, ?12)"
-    " ON CONFLICT (path) DO UPDATE SET source = ?2, size = ?3, modified = ?4, imported = ?5,"
+    " VALUES (?1, ?2, ?3, ?4, ?5, ?6, ?7, ?8, ?9, ?10, ?11, ?12)",
+    // kChangeMedia
+    "UPDATE media SET path = ?1, source = ?2, size = ?3, modified = ?4, imported = ?5,"
     " media_type = ?6, duration = ?7, seekable = ?8, title = ?9, artist = ?10, album = ?11,"
-    " thumbnail_tries = CASE WHEN EXISTS (SELECT 1 FROM thumbnail WHERE media_id = media.id)"
-    " THEN 0 ELSE ?12 END RETURNING id",
-    // kDropChangedThumbnail
-    "DELETE FROM thumbnail WHERE media_id ="
-    " (SELECT id FROM media WHERE path = ?1 AND (size <> ?2 OR modified <> ?3))",
+    " thumbnail_tries = CASE WHEN EXISTS (SELECT 1 FROM thumbnail WHERE media_id = ?13)"
+    " THEN 0 ELSE ?12 END WHERE id = ?13",
+    // kIndexMedia
+    "INSERT INTO media_search (rowid, title, artist, album, path) VALUES (?1, ?2, ?3, ?4, ?5)",
+    // kDropThumbnail
+    "DELETE FROM thumbnail WHERE media_id = ?1",
     // kDropVideo, kDropAudio, kDropTags
     "DELETE FROM video_stream WHERE media_id = ?1", "DELETE FROM audio_stream WHERE media_id = ?1",
     "DELETE FROM tag WHERE media_id = ?1",
@@ -83,6 +90,10 @@ constexpr std::array<const char*, kQueryCount> kQueries = {
     // kPutThumbnail
     "INSERT OR REPLACE INTO thumbnail SELECT id, ?5 FROM media"
     " WHERE id = ?1 AND path = ?2 AND size = ?3 AND modified = ?4"};
+
+Headline headlineOf(const std::vector<Tag>& tags) {
+    return {firstValue(tags, "TITLE"), firstValue(tags, "ARTIST"), firstValue(tags, "ALBUM")};
+}
 
 void bindAll(SQLite::Statement&, int) {}
 
@@ -129,13 +140,20 @@ private:
 };
 
 Database::Transaction::Transaction(Database& database, Durability durability)
-    : mFile(database.mFile), mTransaction(checked(mFile, [&] {
+    : mOwner(database), mTransaction(checked(database.mFile, [&] {
           database.setDurability(durability);
           return SQLite::Transaction(database.mDatabase, SQLite::TransactionBehavior::IMMEDIATE);
       })) {}
 
+Database::Transaction::~Transaction() {
+    mOwner.mAdded.clear();
+}
+
 void Database::Transaction::commit() {
-    checked(mFile, [this] { mTransaction.commit(); });
+    checked(mOwner.mFile, [this] {
+        mOwner.indexAdded();
+        mTransaction.commit();
+    });
 }
 
 Database::Database(const std::string& file)
@@ -200,31 +218,62 @@ void Database::abandon() {
     sqlite3_db_config(mDatabase.getHandle(), SQLITE_DBCONFIG_NO_CKPT_ON_CLOSE, 1, nullptr);
 }
 
+template<typename... Values>
+void Database::useWithFields(std::size_t query, const MediaRecord& record, const Headline& headline,
+                             const Values&... others) {
+    const auto& system = record.info.system;
+    Use(*this, static_cast<Query>(query), record.path, record.source, record.size, record.modified,
+        record.imported, system.mediaType, system.duration, system.seekable ? 1 : 0, headline.title,
+        headline.artist, headline.album, record.hasPicture ? kThumbnailTries : 0, others...)
+        .run();
+}
+
 void Database::put(const MediaRecord& record) {
     checked(mFile, [&] {
         const std::vector<Tag> tags = parseTags(record.info.system.tags);
-        Use(*this, kDropChangedThumbnail, record.path, record.size, record.modified).run();
-        const std::int64_t id = putMedia(record, tags);
-        putStreams(id, record.info);
-        putTags(id, tags);
+        std::int64_t id = 0;
+        bool isSame = false;
+        if (Use known(*this, kFindMedia, record.path); known.next()) {
+            id = known.number(0);
+            isSame = known.number(1) == record.size && known.number(2) == record.modified;
+        }
+        if (id == 0)
+            return addMedia(record, tags);
+        if (!isSame)
+            Use(*this, kDropThumbnail, id).run();
+        changeMedia(id, record, tags);
     });
 }
 
-std::int64_t Database::putMedia(const MediaRecord& record, const std::vector<Tag>& tags) {
-    const auto& system = record.info.system;
-    Use row(*this, kPutMedia, record.path, record.source, record.size, record.modified,
-            record.imported, system.mediaType, system.duration, system.seekable ? 1 : 0,
-            firstValue(tags, "TITLE"), firstValue(tags, "ARTIST"), firstValue(tags, "ALBUM"),
-            record.hasPicture ? kThumbnailTries : 0);
-    row.next();
-    const std::int64_t id = row.number(0);
-    row.run();
-    return id;
+void Database::addMedia(const MediaRecord& record, const std::vector<Tag>& tags) {
+    const Headline headline = headlineOf(tags);
+    useWithFields(kAddMedia, record, headline);
+    const std::int64_t id = mDatabase.getLastInsertRowid();
+    mAdded.push_back({id, headline, record.path});
+    putStreams(id, record.info);
+    putTags(id, tags);
+}
+
+void Database::changeMedia(std::int64_t id, const MediaRecord& record,
+                           const std::vector<Tag>& tags) {
+    indexAdded(); // it may be among them
+    useWithFields(kChangeMedia, record, headlineOf(tags), id);
+    for (const Query drop : {kDropVideo, kDropAudio, kDropTags})
+        Use(*this, drop, id).run();
+    putStreams(id, record.info);
+    putTags(id, tags);
+}
+
+/** All at once and one statement each, or the index would write them out one by one. */
+void Database::indexAdded() {
+    for (const Added& added : mAdded)
+        Use(*this, kIndexMedia, added.id, added.headline.title, added.headline.artist,
+            added.headline.album, added.path)
+            .run();
+    mAdded.clear();
 }
 
 void Database::putStreams(std::int64_t id, const MediaMetaInfo& info) {
-    Use(*this, kDropVideo, id).run();
-    Use(*this, kDropAudio, id).run();
     if (info.videoCount > 0)
         putVideo(id, info.video);
     for (int number = 0; number < info.audioCount; ++number)
@@ -246,7 +295,6 @@ void Database::putAudio(std::int64_t id, int number, const AudioMetaInfo& audio)
 }
 
 void Database::putTags(std::int64_t id, const std::vector<Tag>& tags) {
-    Use(*this, kDropTags, id).run();
     int number = 0;
     for (const Tag& tag : tags)
         Use(*this, kPutTag, id, number++, tag.key, tag.value).run();

@@ -27,6 +27,13 @@ struct PendingCopy {
     ino_t inode = 0;
 };
 
+/** The tags that every list of media shows. */
+struct Headline {
+    std::string title;
+    std::string artist;
+    std::string album;
+};
+
 /** A medium that has no thumbnail yet, and the content that it is to be drawn from. */
 struct MissingThumbnail {
     std::int64_t id = 0;
@@ -60,10 +67,13 @@ public:
     class Transaction {
     public:
         explicit Transaction(Database& database, Durability durability = Durability::kKept);
+        ~Transaction();
+        Transaction(const Transaction&) = delete;
+        Transaction& operator=(const Transaction&) = delete;
         void commit();
 
     private:
-        const std::string mFile;
+        Database& mOwner;
         SQLite::Transaction mTransaction;
     };
 
@@ -95,19 +105,32 @@ public:
 private:
     class Use;
 
+    /** What a row has for the search index. */
+    struct Added {
+        std::int64_t id;
+        Headline headline;
+        std::string path;
+    };
+
     void setDurability(Durability durability);
     void migrate();
     void prepare();
+    template<typename... Values>
+    void useWithFields(std::size_t query, const MediaRecord& record, const Headline& headline,
+                       const Values&... others);
+    void addMedia(const MediaRecord& record, const std::vector<Tag>& tags);
+    void changeMedia(std::int64_t id, const MediaRecord& record, const std::vector<Tag>& tags);
+    void indexAdded();
     void putStreams(std::int64_t id, const LibMediaPlayer::MediaMetaInfo& info);
     void putVideo(std::int64_t id, const LibMediaPlayer::VideoMetaInfo& video);
     void putAudio(std::int64_t id, int number, const LibMediaPlayer::AudioMetaInfo& audio);
     void putTags(std::int64_t id, const std::vector<Tag>& tags);
-    std::int64_t putMedia(const MediaRecord& record, const std::vector<Tag>& tags);
 
     const std::string mFile;
     SQLite::Database mDatabase;
     std::vector<SQLite::Statement> mStatements; ///< after the database, so that they go first
     Durability mDurability = Durability::kKept;
+    std::vector<Added> mAdded; ///< by this transaction, and not yet in the search index
     dev_t mDevice = 0;
     ino_t mInode = 0;
 };

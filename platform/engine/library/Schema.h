@@ -12,7 +12,7 @@ inline constexpr int kApplicationId = 0x514e534d;
  * How a database comes from one version (`user_version`) to the next. The first begins an empty
  * one; what has been delivered is never changed, a new version appends a text.
  */
-inline constexpr std::array<const char*, 1> kMigrations = {
+inline constexpr std::array<const char*, 2> kMigrations = {
     R"sql(
 CREATE TABLE media (
     id INTEGER PRIMARY KEY,
@@ -99,6 +99,21 @@ CREATE TRIGGER media_removed AFTER DELETE ON media BEGIN
         VALUES ('delete', old.id, old.title, old.artist, old.album, old.path);
 END;
 CREATE TRIGGER media_changed AFTER UPDATE OF title, artist, album, path ON media BEGIN
+    INSERT INTO media_search (media_search, rowid, title, artist, album, path)
+        VALUES ('delete', old.id, old.title, old.artist, old.album, old.path);
+    INSERT INTO media_search (rowid, title, artist, album, path)
+        VALUES (new.id, new.title, new.artist, new.album, new.path);
+END;
+)sql",
+    // Each statement that writes rows makes the index write out what it has gathered, so that an
+    // index entry a row costs more than the row. New rows are indexed together, by whoever adds
+    // them; changes only where there are some.
+    R"sql(
+DROP TRIGGER media_added;
+DROP TRIGGER media_changed;
+CREATE TRIGGER media_changed AFTER UPDATE OF title, artist, album, path ON media
+    WHEN (new.title, new.artist, new.album, new.path)
+        IS NOT (old.title, old.artist, old.album, old.path) BEGIN
     INSERT INTO media_search (media_search, rowid, title, artist, album, path)
         VALUES ('delete', old.id, old.title, old.artist, old.album, old.path);
     INSERT INTO media_search (rowid, title, artist, album, path)
