@@ -905,7 +905,8 @@ def _import(connection, options):
 
 def _monitor(connection, _):
     events = queue.Queue()
-    Player(connection, on_notification=events.put)
+    player = Player(connection, on_notification=events.put)
+    print(player.status(), flush=True)
     for event in iter(events.get, None):
         print(event, flush=True)
     connection.raise_if_lost()

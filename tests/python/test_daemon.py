@@ -2,6 +2,7 @@
 """The Python client and the real daemon, which have nothing but the protocol's page in common."""
 
 import os
+import signal
 import subprocess
 import sys
 import tempfile
@@ -211,11 +212,14 @@ class AClientThatRestarts(DaemonTest):
 
 
 class TheCommandLine(DaemonTest):
+    @staticmethod
+    def command(identity, *arguments):
+        return [sys.executable, qnsmedia.__file__, "--timeout", str(PATIENCE),
+                "--identity", str(identity), *arguments]
+
     def run_tool(self, identity, *arguments, status=0):
-        done = subprocess.run(
-            [sys.executable, qnsmedia.__file__, "--timeout", str(PATIENCE),
-             "--identity", str(identity), *arguments],
-            capture_output=True, encoding="utf-8", timeout=PATIENCE, check=False)
+        done = subprocess.run(self.command(identity, *arguments), capture_output=True,
+                              encoding="utf-8", timeout=PATIENCE, check=False)
         self.assertEqual(done.returncode, status, done.stderr)
         return done.stdout + done.stderr
 
@@ -233,6 +237,23 @@ class TheCommandLine(DaemonTest):
         self.assertEqual(self.daemon.wait(PATIENCE), 0)
         self.assertIn("not running", self.run_tool(1000, "status", status=3))
         self.run_tool(1000, "dance", status=2)
+
+    def test_tells_what_happens_until_it_is_interrupted(self):
+        with subprocess.Popen(self.command(1000, "monitor"), encoding="utf-8",
+                              stdout=subprocess.PIPE) as monitor:
+            self.assertIn("NOT_READY", monitor.stdout.readline())
+            qnsmedia.Player(self.connect(1001)).open(film)
+            self.assertIn(film, next(line for line in monitor.stdout if "OPENED" in line))
+            monitor.send_signal(signal.SIGINT)
+            self.assertEqual(monitor.wait(PATIENCE), 130)
+
+    def test_notices_the_end_of_the_daemon(self):
+        with subprocess.Popen(self.command(1000, "monitor"), encoding="utf-8",
+                              stdout=subprocess.PIPE, stderr=subprocess.PIPE) as monitor:
+            self.assertIn("NOT_READY", monitor.stdout.readline())
+            self.daemon.send_signal(signal.SIGTERM)
+            self.assertIn("ended its connection", monitor.communicate(timeout=PATIENCE)[1])
+            self.assertEqual(monitor.returncode, 4)
 
 
 if __name__ == "__main__":
