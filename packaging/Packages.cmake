@@ -6,6 +6,7 @@ set(CPACK_PACKAGE_VENDOR "The QNSMediaService developers")
 set(CPACK_PACKAGE_CONTACT "The QNSMediaService developers <qnsmedia@localhost>")
 set(CPACK_PACKAGE_DIRECTORY "${PROJECT_BINARY_DIR}/packages")
 set(CPACK_STRIP_FILES ON)
+set(CPACK_PRE_BUILD_SCRIPTS "${CMAKE_CURRENT_SOURCE_DIR}/CompressManuals.cmake")
 # Units and the like name the folders that this build was configured for.
 set(CPACK_PACKAGING_INSTALL_PREFIX "${CMAKE_INSTALL_PREFIX}")
 
@@ -50,7 +51,7 @@ qns_package(engine libmediaplayer-proxy1 libs "media engine of the media service
     DEPENDS "libqnsys1 (>= 1.0), gstreamer1.0-plugins-base"
     RECOMMENDS "gstreamer1.0-alsa, gstreamer1.0-plugins-good, gstreamer1.0-plugins-bad, gstreamer1.0-plugins-ugly, gstreamer1.0-libav")
 qns_package(qnsys libqnsys1 libs "system services of the media service, on plain Linux"
-    "Directories, system log and back-traces for the daemon. A device can bring another.")
+    "Directories, system log, back-traces. A device can bring another.")
 qns_package(client libqnsmediaclient1 libs "client library of the media service"
     "Lets a program play, read and import media through the daemon.")
 qns_package(development libqnsmedia-dev libdevel "development files of the media service"

@@ -64,6 +64,11 @@ TEST_F(Development, TheSystemServicesAreAHeaderOfCToo) {
     outputOf("echo '#include <qnsys.h>' | gcc -std=c11 -fsyntax-only -x c -");
 }
 
+TEST_F(Development, TheExampleIsBuiltFromWhereItLies) {
+    outputOf(QNS_CXX " -std=c++17 /usr/share/doc/libqnsmedia-dev/examples/play.cpp -o " +
+             mFolder.path("play") + " $(pkg-config --cflags --libs qnsmediaclient)");
+}
+
 TEST_F(Development, AnotherMajorVersionIsNotTakenForThisOne) {
     std::ofstream(mFolder.path("CMakeLists.txt"))
         << "cmake_minimum_required(VERSION 3.25)\nproject(program CXX)\n"

@@ -60,6 +60,11 @@ TEST_F(Installation, LibrariesHaveTheNamesThatTheLoaderAsksFor) {
         EXPECT_THAT(outputOf("ldconfig --print-cache"), HasSubstr(std::string(name) + " ("));
 }
 
+TEST_F(Installation, ManualPagesAreCompressed) {
+    for (const char* page : {"man1/qnsmedia.1.gz", "man8/QNSMediaService.8.gz"})
+        EXPECT_THAT(outputOf(std::string("zcat /usr/share/man/") + page), HasSubstr(".TH "));
+}
+
 TEST_F(Installation, TheDaemonHasAUserWhoMayUseDevicesAndNothingElse) {
     EXPECT_THAT(linesOf(outputOf("id --name --groups qnsmedia | tr ' ' '\\n' | sort")),
                 ElementsAre("audio", "qnsmedia", "render", "video"));

@@ -57,6 +57,11 @@ TEST_F(Service, Plays) {
     EXPECT_THAT(outputOf("qnsmedia play /srv/film.mp4"), HasSubstr("1 video, 1 audio"));
 }
 
+TEST_F(Service, ServesAClientThatComesAgain) {
+    for (int i = 0; i < 3; ++i)
+        EXPECT_THAT(outputOf("qnsmedia --identity 1003 status"), HasSubstr("0:00.0 / 0:00.0"));
+}
+
 TEST_F(Service, DrawsPicturesIntoItsFolderForItsGroup) {
     outputOf("qnsmedia image /srv/film.mp4 -o /run/qnsmedia/film.jpg");
     EXPECT_EQ(outputOf("stat --format='%U %G %a' /run/qnsmedia/film.jpg"),
