@@ -6,6 +6,7 @@
 #include <cstring>
 #include <fcntl.h>
 #include <filesystem>
+#include <fstream>
 #include <iterator>
 #include <poll.h>
 #include <spawn.h>
@@ -218,6 +219,14 @@ std::size_t DaemonProcess::descriptorCount() const {
 
 std::size_t DaemonProcess::threadCount() const {
     return entries(mPid, "task");
+}
+
+std::size_t DaemonProcess::residentBytes() const {
+    std::ifstream pages("/proc/" + std::to_string(mPid) + "/statm");
+    std::size_t all = 0;
+    std::size_t resident = 0;
+    pages >> all >> resident;
+    return resident * static_cast<std::size_t>(::sysconf(_SC_PAGESIZE));
 }
 
 bool DaemonProcess::waitForResources(std::size_t descriptors, std::size_t threads) const {

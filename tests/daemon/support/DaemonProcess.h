@@ -80,6 +80,9 @@ public:
     [[nodiscard]] std::size_t descriptorCount() const;
     [[nodiscard]] std::size_t threadCount() const;
 
+    /** Bytes of memory in use at this moment. */
+    [[nodiscard]] std::size_t residentBytes() const;
+
     /** Waits until there are no more than that many of either. */
     [[nodiscard]] bool waitForResources(std::size_t descriptors, std::size_t threads) const;
 

@@ -19,13 +19,16 @@ constexpr WireService kAllServices[] = {kDiscovererService, kImporterService, kP
 
 /**
  * One of a client process's lives, from its start to its end, as the daemon sees it: the port
- * that it listens on, and what is sent there. Its requests go over the connection of another, so
- * that a test need not wait for a new one to be accepted.
+ * that it listens on, and what is sent there. Its requests may go over the connection of another,
+ * so that a test need not wait for a new one to be accepted.
  */
 class Life : public WireClient {
 public:
     /** `road` must be connected, and outlive this one. */
     Life(WireClient& road, long identity) : WireClient(identity), mRoad(road) {}
+
+    /** Over a connection of its own. */
+    explicit Life(long identity) : WireClient(identity), mRoad(*this) { connect(); }
 
     /** Registers a callback object and waits for the client id; -1 when there is no answer. */
     std::int32_t registerCallBack(const WireService& service);

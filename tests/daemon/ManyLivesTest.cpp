@@ -1,0 +1,31 @@
+// SPDX-License-Identifier: MIT
+#include <string>
+
+#include "tests/daemon/support/LivesTest.h"
+
+namespace {
+
+class ManyTools : public LivesTest {};
+
+TEST_F(ManyTools, AThousandInARowWithOneIdentityAllWorkAndLeaveNothingBehind) {
+    constexpr int kWarmUp = 100;
+    constexpr int kCalls = 1000;
+    const auto call = [](int number) {
+        if (number % 2 == 0)
+            expectSuccess({"--identity", "1000", "status"});
+        else
+            expectSuccess({"--identity", "1000", "info", sample::shortSound()});
+    };
+    for (int number = 0; number < kWarmUp; ++number)
+        call(number);
+    const auto descriptors = mpDaemon->descriptorCount();
+    const auto threads = mpDaemon->threadCount();
+    const auto memory = mpDaemon->residentBytes();
+    for (int number = 0; number < kCalls; ++number)
+        call(number);
+    EXPECT_TRUE(mpDaemon->waitForResources(descriptors, threads))
+        << mpDaemon->descriptorCount() << " descriptors, " << mpDaemon->threadCount() << " threads";
+    RecordProperty("grown", std::to_string(static_cast<long>(mpDaemon->residentBytes() - memory)));
+}
+
+} // namespace
