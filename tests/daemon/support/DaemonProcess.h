@@ -15,6 +15,7 @@
 
 #include "base/UniqueFd.h"
 #include "tests/daemon/support/Lines.h"
+#include "tests/daemon/support/Patience.h"
 
 /** How a daemon is started. */
 struct DaemonOptions {
@@ -63,7 +64,7 @@ public:
     /** All that the process has written up to now. */
     [[nodiscard]] const Lines& output();
 
-    void signal(int number) const;
+    void signal(int number);
 
     /** Sends the signal to every thread of the process by itself. */
     void signalEachThread(int number) const;
@@ -93,8 +94,10 @@ private:
     void readLoop();
     bool readAvailable();
     void checkOutput() const;
+    [[nodiscard]] bool endsBefore(patience::Clock::time_point deadline, int process) const;
 
     pid_t mPid = -1;
+    int mLastSignal = 0;
     std::optional<int> mStatus;
     qns::UniqueFd mRead;
     qns::UniqueFd mFullPipe; ///< read end of a pipe that nobody reads
