@@ -46,19 +46,23 @@ int drawImage(MediaFile& file, std::chrono::nanoseconds position, Size asked,
 } // namespace
 
 int Discoverer::open(const std::wstring& path) {
-    return handle::guarded(static_cast<int>(kInternal), [&] {
-        close();
-        const engine::Medium medium = engine::toMedium(path);
-        if (medium.path.empty())
-            return static_cast<int>(medium.uri.empty() ? kNotFound : kNotAvailable);
-        const int result = mFile.open(medium.path);
-        if (result == kOk)
-            mPath = medium.path;
-        return result;
-    });
+    close();
+    mFailure = handle::guarded(static_cast<int>(kInternal), [&] { return openMedium(path); });
+    return mFailure;
+}
+
+int Discoverer::openMedium(const std::wstring& path) {
+    const engine::Medium medium = engine::toMedium(path);
+    if (medium.path.empty())
+        return medium.uri.empty() ? kNotFound : kNotAvailable;
+    const int result = mFile.open(medium.path);
+    if (result == kOk)
+        mPath = medium.path;
+    return result;
 }
 
 int Discoverer::close() {
+    mFailure = kWrongState;
     mPath.clear();
     mFile.close();
     return kOk;
@@ -68,7 +72,7 @@ int Discoverer::metadata(MediaMetaInfo& info) {
     return handle::guarded(static_cast<int>(kInternal), [&] {
         const auto details = mFile.describe();
         if (!details)
-            return static_cast<int>(kWrongState);
+            return mFailure;
         info = details->info;
         return static_cast<int>(kOk);
     });

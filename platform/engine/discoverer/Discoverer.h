@@ -4,6 +4,7 @@
 #include <string>
 
 #include "LibMediaPlayer/IMediaDiscoverer.h"
+#include "LibMediaPlayer/Result.h"
 #include "discoverer/DescribedFile.h"
 
 namespace discoverer {
@@ -21,6 +22,9 @@ public:
     int supportedExtensions(LibMediaPlayer::SupportedExtensions& extensions) override;
 
 private:
+    int openMedium(const std::wstring& path);
+
+    int mFailure = LibMediaPlayer::kWrongState; ///< why no file is open
     std::string mPath;
     DescribedFile mFile;
 };

@@ -71,7 +71,10 @@ public:
     virtual int open(const std::wstring& path) = 0;
     virtual int close() = 0;
 
-    /** Fills `info`, all texts together bounded so that they fit one answer to a client. */
+    /**
+     * Fills `info`, all texts together bounded so that they fit one answer to a client. After an
+     * open() that failed it returns that result again.
+     */
     virtual int metadata(MediaMetaInfo& info) = 0;
 
     /** Kept for the binary interface; returns kWrongState. */
