@@ -11,34 +11,9 @@
 namespace qnsmedia {
 namespace {
 
-const char* words(int result) {
-    switch (result) {
-    case 1:
-        return "not found";
-    case 2:
-        return "access denied";
-    case 3:
-        return "not media, or no decoder for it";
-    case 4:
-        return "damaged";
-    case 5:
-        return "not available";
-    case 6:
-        return "cancelled";
-    case 7:
-        return "took too long";
-    case 8:
-        return "no space left";
-    case -1:
-        return "not possible";
-    default:
-        return "internal error";
-    }
-}
-
 void requireSuccess(const std::string& name, int result) {
     if (result != 0)
-        throw MediaError(result, name + ": " + words(result));
+        throw MediaError(result, name + ": " + resultText(result));
 }
 
 void readOpened(const std::string& name, ArgumentReader& answer) {

@@ -54,12 +54,15 @@ public:
 
     /**
      * The engine's code: 1 not found, 2 access denied, 3 not media or no decoder, 4 damaged,
-     * 5 not available, 6 cancelled, 7 timed out, 8 no space, 9 internal.
+     * 5 not available, 6 cancelled, 7 timed out, 8 no space, 9 internal, -1 not possible.
      */
     [[nodiscard]] int result() const noexcept { return mResult; }
 
 private:
     int mResult;
 };
+
+/** The engine's code in a few words: "not found". Any thread. */
+QNSMEDIA_API std::string resultText(int result);
 
 } // namespace qnsmedia
