@@ -4,6 +4,7 @@
 #include <filesystem>
 #include <nlohmann/json.hpp>
 #include <set>
+#include <unistd.h>
 
 #include "cli/Commands.h"
 #include "cli/ExitCode.h"
@@ -108,7 +109,8 @@ int importCommand(const qnsmedia::Connection::Options& options, const ImportRequ
         findImportFiles(request.paths, extensionsFor(connection, request.paths));
     for (const std::string& folder : found.unreadable)
         std::fprintf(stderr, "qnsmedia: %s\n", folder.c_str());
-    ImportRun run(connection, found.files, request.folder);
+    ImportRun run(connection, found.files, request.folder,
+                  !request.json && ::isatty(STDOUT_FILENO) != 0);
     const int signal = run.run();
     tellFailures(found.files, run.outcomes());
     const Summary summary = summarize(found.files, run.outcomes());

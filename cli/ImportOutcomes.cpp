@@ -1,9 +1,8 @@
 // SPDX-License-Identifier: MIT
 #include "cli/ImportOutcomes.h"
 
-#include <cctype>
+#include <algorithm>
 #include <filesystem>
-#include <utility>
 
 #include "qnsmedia/Error.h"
 
@@ -25,24 +24,28 @@ std::string normalFolder(const std::string& folder) {
     return begin == std::string::npos ? "" : normal.substr(begin, end + 1 - begin);
 }
 
-/** "song (2).mp3" is what becomes of "song.mp3" where that name is taken. */
-bool isNumbered(const std::string& name, const std::string& original) {
-    const std::filesystem::path path(original);
-    const std::string begin = path.stem().string() + " (";
-    const std::string end = ")" + path.extension().string();
-    if (name.size() <= begin.size() + end.size() || name.compare(0, begin.size(), begin) != 0 ||
-        !endsWith(name, end))
-        return false;
-    for (std::size_t at = begin.size(); at < name.size() - end.size(); ++at)
-        if (std::isdigit(static_cast<unsigned char>(name[at])) == 0)
-            return false;
-    return true;
+/** "song.mp3" for "song (2).mp3", which it becomes where the name is taken; else the name. */
+std::string withoutNumber(const std::string& name) {
+    const std::filesystem::path path(name);
+    const std::string stem = path.stem().string();
+    const std::size_t begin = stem.rfind(" (");
+    if (begin == std::string::npos || begin + 3 >= stem.size() || stem.back() != ')' ||
+        stem.find_first_not_of("0123456789", begin + 2) != stem.size() - 1)
+        return name;
+    return stem.substr(0, begin) + path.extension().string();
 }
 
 } // namespace
 
 ImportOutcomes::ImportOutcomes(const std::vector<ImportFile>& files, const std::string& folder)
-    : mFiles(files), mFolder(normalFolder(folder)), mOutcomes(files.size()) {}
+    : mFiles(files), mFolder(normalFolder(folder)), mOutcomes(files.size()) {
+    for (std::size_t index = 0; index < files.size(); ++index) {
+        const ImportFile& file = files[index];
+        mByName.emplace(mFolder.empty() ? file.real : lastName(file.real), index);
+        mByPath.emplace(file.path, index);
+        mByPath.emplace(file.real, index);
+    }
+}
 
 /** What an engine says of another client's file ends here, too: nothing of ours is named. */
 void ImportOutcomes::tell(const qnsmedia::ImportNotification& notification) {
@@ -68,40 +71,40 @@ void ImportOutcomes::settle(std::size_t index, int result, const std::string& te
         return;
     }
     outcome = {true, result, text};
-    while (mFirstOpen < mOutcomes.size() && mOutcomes[mFirstOpen].known)
-        ++mFirstOpen;
 }
 
 /** A path that is told again is the same import; and of several that fit it is the oldest. */
 std::size_t ImportOutcomes::importedAs(const std::string& path) {
     if (mTold.count(path) != 0)
         return kNone;
-    for (std::size_t index = mFirstOpen; index < mFiles.size(); ++index) {
-        if (mOutcomes[index].known || !fits(mFiles[index], path))
-            continue;
-        mTold.insert(path);
-        return index;
+    std::size_t index = kNone;
+    if (mFolder.empty()) {
+        index = firstOpen(path);
+    } else if (endsWith(path.substr(0, path.rfind('/')), "/" + mFolder)) {
+        const std::string name = lastName(path);
+        index = std::min(firstOpen(name), firstOpen(withoutNumber(name)));
     }
+    if (index != kNone)
+        mTold.insert(path);
+    return index;
+}
+
+std::size_t ImportOutcomes::firstOpen(const std::string& name) const {
+    const auto [begin, end] = mByName.equal_range(name);
+    for (auto each = begin; each != end; ++each)
+        if (const Outcome& outcome = mOutcomes[each->second]; !outcome.known || outcome.result != 0)
+            return each->second;
     return kNone;
 }
 
-bool ImportOutcomes::fits(const ImportFile& file, const std::string& path) const {
-    if (mFolder.empty())
-        return path == file.real;
-    if (!endsWith(path.substr(0, path.rfind('/')), "/" + mFolder))
-        return false;
-    const std::string name = lastName(path);
-    const std::string original = lastName(file.real);
-    return name == original || isNumbered(name, original);
-}
-
+/** Messages end with the path, or with the path and a reason in brackets. */
 std::size_t ImportOutcomes::namedIn(const std::string& message) const {
-    const auto names = [&](const std::string& path) {
-        return message.find(": " + path + " (") != std::string::npos ||
-               endsWith(message, ": " + path);
-    };
-    for (std::size_t index = mFirstOpen; index < mFiles.size(); ++index)
-        if (!mOutcomes[index].known && (names(mFiles[index].path) || names(mFiles[index].real)))
-            return index;
-    return kNone;
+    for (std::size_t at = 0; (at = message.find(": ", at)) != std::string::npos; at += 2) {
+        const std::string rest = message.substr(at + 2);
+        for (std::size_t end = rest.size(); end != std::string::npos && end > 0;
+             end = rest.rfind(" (", end - 1))
+            if (const auto file = mByPath.find(rest.substr(0, end)); file != mByPath.end())
+                return file->second;
+    }
+    return mOneByOne ? mCurrent : kNone;
 }

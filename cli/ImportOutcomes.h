@@ -3,6 +3,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <map>
 #include <set>
 #include <string>
 #include <vector>
@@ -30,8 +31,14 @@ public:
     void setCurrent(std::size_t index) { mCurrent = index; }
     void setNoCurrent() { mCurrent = kNone; }
 
-    /** From now on what was told before may be told again of another file. */
-    void forgetTold() { mTold.clear(); }
+    /**
+     * From now on one file at a time is asked for: what was told before may be told again, and
+     * what names no file is of the current one.
+     */
+    void beginOneByOne() {
+        mOneByOne = true;
+        mTold.clear();
+    }
 
     /** The daemon tells something. */
     void tell(const qnsmedia::ImportNotification& notification);
@@ -47,13 +54,15 @@ private:
 
     [[nodiscard]] std::size_t importedAs(const std::string& path);
     [[nodiscard]] std::size_t namedIn(const std::string& message) const;
-    [[nodiscard]] bool fits(const ImportFile& file, const std::string& path) const;
+    [[nodiscard]] std::size_t firstOpen(const std::string& name) const;
 
     const std::vector<ImportFile>& mFiles;
     const std::string mFolder; ///< without slashes around it
     std::vector<Outcome> mOutcomes;
+    std::multimap<std::string, std::size_t> mByName; ///< by what it may be called in the library
+    std::map<std::string, std::size_t> mByPath;
     std::size_t mCurrent = kNone;
-    std::size_t mFirstOpen = 0; ///< all before it are known
+    bool mOneByOne = false;
     std::size_t mKnownCount = 0;
     std::int64_t mKnownBytes = 0;
     std::set<std::string> mTold; ///< paths in the library that were matched

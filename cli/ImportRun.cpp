@@ -2,10 +2,10 @@
 #include "cli/ImportRun.h"
 
 #include <algorithm>
-#include <cstdio>
-#include <unistd.h>
+#include <utility>
 
 #include "cli/ImportProgress.h"
+#include "cli/Output.h"
 #include "qnsmedia/Error.h"
 
 using namespace std::chrono_literals;
@@ -22,20 +22,14 @@ constexpr auto kCancelPatience = 10s;
 
 constexpr int kUnknownResult = -1;
 
-/** Where it does not disturb those who read the output. */
-void showOnTerminal(const std::string& text) {
-    std::fputs(text.c_str(), stderr);
-    std::fflush(stderr);
-}
-
 } // namespace
 
 ImportRun::ImportRun(qnsmedia::Connection& connection, const std::vector<ImportFile>& files,
-                     const std::string& folder)
+                     std::string folder, bool showsProgress)
     : mFiles(files),
-      mFolder(folder),
-      mTerminal(::isatty(STDERR_FILENO) != 0),
-      mOutcomes(files, folder),
+      mFolder(std::move(folder)),
+      mShowsProgress(showsProgress),
+      mOutcomes(files, mFolder),
       mImporter(connection) {
     for (const ImportFile& file : files)
         mBytesInAll += file.size;
@@ -67,6 +61,7 @@ std::chrono::milliseconds ImportRun::elapsed() const {
 void ImportRun::sendAll() {
     for (std::size_t index = 0; index < mFiles.size() && mSignal == 0; ++index)
         send(index);
+    mOutcomes.setNoCurrent();
     waitUntil([this] { return allKnown() || isQuiet(); });
 }
 
@@ -76,7 +71,7 @@ void ImportRun::sendOpenOnes() {
         const auto isKnown = [&] { return mOutcomes.of(index).known; };
         if (isKnown())
             continue;
-        mOutcomes.forgetTold();
+        mOutcomes.beginOneByOne();
         send(index);
         if (waitUntil([&] { return isKnown() || isQuiet(); }) && !isKnown())
             mOutcomes.settle(index, kUnknownResult, "the daemon did not tell what became of it");
@@ -91,7 +86,6 @@ void ImportRun::send(std::size_t index) {
         mLoop.post([this, index, error] { sent(index, error); });
     });
     waitUntil([this] { return !mSending; });
-    mOutcomes.setNoCurrent();
 }
 
 void ImportRun::sent(std::size_t index, std::exception_ptr error) {
@@ -175,7 +169,7 @@ bool ImportRun::allKnown() const {
 }
 
 void ImportRun::showProgress() {
-    if (!mTerminal)
+    if (!mShowsProgress)
         return;
     const std::int64_t bytes = std::clamp(mQueueDone, mOutcomes.knownBytes(),
                                           std::max(mOutcomes.knownBytes(), mBytesInAll));
@@ -184,11 +178,11 @@ void ImportRun::showProgress() {
     if (text == mShown)
         return;
     mShown = text;
-    showOnTerminal("\r" + text + "\033[K");
+    show("\r" + text + "\033[K");
 }
 
 void ImportRun::hideProgress() {
     if (!mShown.empty())
-        showOnTerminal("\r\033[K");
+        show("\r\033[K");
     mShown.clear();
 }

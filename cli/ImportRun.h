@@ -21,11 +21,11 @@ class ImportRun {
 public:
     using Clock = std::chrono::steady_clock;
 
-    /** `files` must outlive it. */
+    /** `files` must outlive it. Progress is shown on standard output, a terminal. */
     ImportRun(qnsmedia::Connection& connection, const std::vector<ImportFile>& files,
-              const std::string& folder);
+              std::string folder, bool showsProgress);
 
-    /** Returns the signal that cancelled it, else 0. Throws qnsmedia::Error. */
+    /** Returns the signal that cancelled it, else 0. Throws qnsmedia::Error and OutputFailed. */
     int run();
 
     [[nodiscard]] const ImportOutcomes& outcomes() const { return mOutcomes; }
@@ -53,7 +53,7 @@ private:
 
     const std::vector<ImportFile>& mFiles;
     const std::string mFolder;
-    const bool mTerminal;
+    const bool mShowsProgress;
     const Clock::time_point mBegin = Clock::now();
     std::int64_t mBytesInAll = 0;
     ImportOutcomes mOutcomes;

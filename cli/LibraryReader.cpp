@@ -42,10 +42,12 @@ std::string searchExpression(const std::string& words) {
 
 } // namespace
 
-LibraryReader::LibraryReader(const std::string& file)
+LibraryReader::LibraryReader(const std::string& file) try
     : mDatabase(file, SQLite::OPEN_READONLY, kBusyMilliseconds) {
     if (mDatabase.execAndGet("PRAGMA user_version").getInt() != kVersion)
-        throw SQLite::Exception("not a media library of a version that is known: " + file);
+        throw SQLite::Exception("it is of another version");
+} catch (const SQLite::Exception& exception) {
+    throw SQLite::Exception("the media library cannot be read: " + file + ": " + exception.what());
 }
 
 void LibraryReader::visitAll(SQLite::Statement& query, const Visitor& visit) {
