@@ -1,12 +1,13 @@
 // SPDX-License-Identifier: MIT
-// Shows what a client can do: every step of describing and playing a file through the daemon, in
-// plain words.
+// Shows what a client can do: every step of describing, importing and playing a file through the
+// daemon, in plain words.
 // usage: qnsmedia-tour FILE [FOLDER]    with FOLDER: writes a picture of the file there
 #include <algorithm>
 #include <condition_variable>
 #include <cstdio>
 #include <deque>
 #include <functional>
+#include <future>
 #include <mutex>
 #include <string>
 #include <unistd.h>
@@ -16,6 +17,7 @@
 #include "cli/MediaPath.h"
 #include "qnsmedia/Discoverer.h"
 #include "qnsmedia/Error.h"
+#include "qnsmedia/Importer.h"
 #include "qnsmedia/Player.h"
 
 using namespace std::chrono_literals;
@@ -106,6 +108,7 @@ public:
 private:
     void discover();
     void drawPicture(qnsmedia::Discoverer& discoverer, Nanoseconds position);
+    void importIt();
     void open();
     void play();
     void showPositions(int count);
@@ -129,6 +132,7 @@ void Tour::run() {
     std::printf("Registered as identity %d, client id %d\n", mConnection.identity(),
                 mPlayer.clientId());
     discover();
+    importIt();
     open();
     play();
     if (mMedia.duration == 0s) {
@@ -168,6 +172,27 @@ void Tour::drawPicture(qnsmedia::Discoverer& discoverer, Nanoseconds position) {
     } catch (const qnsmedia::MediaError& error) {
         std::printf("No picture: %s\n", error.what());
     }
+}
+
+/** It stays where it is, and the library gets to know it. */
+void Tour::importIt() {
+    std::promise<qnsmedia::ImportNotification> finished;
+    bool isFinished = false;
+    qnsmedia::Importer importer(mConnection);
+    importer.onNotification([&](const qnsmedia::ImportNotification& notification) {
+        if (notification.kind == qnsmedia::ImportNotificationKind::finished && !isFinished) {
+            isFinished = true;
+            finished.set_value(notification);
+        }
+    });
+    importer.importFile(mPath).get();
+    std::future<qnsmedia::ImportNotification> outcome = finished.get_future();
+    require(outcome.wait_for(kPatience) == std::future_status::ready, "the import");
+    const qnsmedia::ImportNotification told = outcome.get();
+    if (told.result == 0)
+        std::printf("Imported %s into the media library\n", told.text.c_str());
+    else
+        std::printf("Not imported: %s\n", qnsmedia::resultText(told.result).c_str());
 }
 
 void Tour::open() {

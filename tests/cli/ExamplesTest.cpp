@@ -26,6 +26,7 @@ TEST_F(Examples, TheTourTellsEveryStepOfAFilm) {
                              "Described ",
                              "video/mp4",
                              "H.264",
+                             "Imported ",
                              "Opened ",
                              "1 video, 1 audio, 0 text",
                              "duration: 0:10.0; seekable",
@@ -70,6 +71,7 @@ TEST_F(Examples, TheTourDrawsAPictureWhereItMay) {
 TEST_F(Examples, TheTourSaysWhatCannotBePlayed) {
     Tool tool(QNS_TOUR, {sample::noise()}, Tool::Output::pipe);
     EXPECT_EQ(tool.waitForExit(), 1);
+    EXPECT_THAT(tool.output(), HasSubstr("Not imported: not media"));
     EXPECT_THAT(tool.errors(), testing::StartsWith("Failed: "));
 }
 
