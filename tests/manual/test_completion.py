@@ -33,6 +33,10 @@ class Completion:
         self.assertEqual(self.complete(""), set(tool_help.commands_of()))
         self.assertEqual(self.complete("sta"), {"status"})
 
+    def test_offers_the_commands_of_the_library(self):
+        self.assertEqual(self.complete("library "), set(tool_help.commands_of("library")))
+        self.assertEqual(self.complete("library --database film.mp4 se"), {"search"})
+
     def test_offers_the_options_of_every_command(self):
         for command in tool_help.all_commands():
             with self.subTest(command):
@@ -49,13 +53,14 @@ class Completion:
 
     def test_offers_files_where_files_are_wanted(self):
         for words in ("play fi", "info film.mp4 fi", "image fi", "image film.mp4 -o fi",
-                      "image film.mp4 --output fi"):
+                      "image film.mp4 --output fi", "import fi", "library --database fi",
+                      "library show fi"):
             with self.subTest(words):
                 self.assertEqual(self.complete(words), set(FILES))
 
     def test_offers_nothing_where_anything_may_stand(self):
         for words in ("--timeout ", "image film.mp4 --at ", "image film.mp4 --size ",
-                      "extensions fi", "dance "):
+                      "extensions fi", "import --to fi", "library search fi", "dance "):
             with self.subTest(words):
                 self.assertEqual(self.complete(words), set())
 

@@ -170,7 +170,7 @@ class TheImporter(DaemonTest):
     def test_does_not_take_a_file_of_which_nothing_can_be_read(self):
         self.importer.import_file("/nowhere/film.mp4")
         finished = self.events.wait_for(ImporterEvent.FINISHED)
-        self.assertEqual((finished.result, finished.text), (qnsmedia.Result.WRONG_ARGUMENT, ""))
+        self.assertEqual((finished.result, finished.text), (qnsmedia.Result.NOT_FOUND, ""))
 
     def test_can_be_told_to_stop(self):
         self.importer.cancel()
