@@ -1,4 +1,5 @@
 // SPDX-License-Identifier: MIT
+#include <algorithm>
 #include <chrono>
 #include <cstdlib>
 #include <filesystem>
@@ -31,14 +32,20 @@ std::string contentOf(const std::filesystem::path& path) {
     return {std::istreambuf_iterator<char>(file), {}};
 }
 
-/** Cuts some, and flips bits in others: near the beginning as often as anywhere. */
+/** Some end early, some have a hole, and of most some bits are wrong. */
 std::string damaged(std::string content, std::mt19937& random) {
     if (content.empty())
         return content;
     if (random() % 3 == 0)
-        content.resize(random() % content.size());
+        content.resize(random() % content.size() + 1);
+    if (random() % 4 == 0) {
+        const std::size_t begin = random() % content.size();
+        const std::size_t length = std::min<std::size_t>(random() % 4096, content.size() - begin);
+        content.replace(begin, length, length, '\0');
+    }
+    // Near the beginning as often as anywhere: there are the headers.
     const std::size_t reach = random() % 2 == 0 ? content.size() : content.size() / 50 + 1;
-    for (unsigned int count = random() % 20; count > 0 && !content.empty(); --count)
+    for (unsigned int count = random() % 20; count > 0; --count)
         content[random() % std::min(reach, content.size())] ^=
             static_cast<char>(1U << (random() % 8));
     return content;
@@ -77,6 +84,7 @@ TEST_P(DamagedCopiesOf, AreReadAsFarAsTheyGoOrRefused) {
     std::mt19937 random(1);
     const std::string content = contentOf(truthPath(GetParam().name));
     for (int copy = 0; copy < copies(); ++copy) {
+        SCOPED_TRACE(copy);
         std::ofstream(mFolder / "copy", std::ios::binary) << damaged(content, random);
         ask();
     }

@@ -164,6 +164,29 @@ TEST_P(Discovery, AgreesWithFfprobe) {
 INSTANTIATE_TEST_SUITE_P(Engine, Discovery, testing::ValuesIn(trueMedia()),
                          [](const auto& instance) { return testName(instance.param.name); });
 
+TEST(Discoverer, TellsLayersOfMpegSoundApart) {
+    const std::unique_ptr<IMediaDiscoverer> pDiscoverer(InterfaceFactory::createDiscoverer());
+    for (const auto& [name, layer] :
+         {std::pair("bare.mp2", L"MP2"), std::pair("headless.mp3", L"MP3"),
+          std::pair("constant.mp3", L"MP3")}) {
+        MediaMetaInfo info;
+        ASSERT_EQ(pDiscoverer->open(truthPath(name).wstring()), kOk);
+        ASSERT_EQ(pDiscoverer->metadata(info), kOk);
+        EXPECT_EQ(info.audio[0].description.substr(0, 3), layer) << name;
+    }
+}
+
+TEST(Discoverer, ReckonsTheBitRateOfBareSoundFromAllOfIt) {
+    const std::unique_ptr<IMediaDiscoverer> pDiscoverer(InterfaceFactory::createDiscoverer());
+    for (const char* const name : {"bare.aac", "bare.ac3", "headless.mp3"}) {
+        MediaMetaInfo info;
+        ASSERT_EQ(pDiscoverer->open(truthPath(name).wstring()), kOk);
+        ASSERT_EQ(pDiscoverer->metadata(info), kOk);
+        const double bits = 8.0 * static_cast<double>(std::filesystem::file_size(truthPath(name)));
+        EXPECT_NEAR(info.audio[0].bitRate, bits / seconds(info.system.duration), 1) << name;
+    }
+}
+
 TEST(Discoverer, ThereAreFiftyFilesAtLeast) {
     EXPECT_GE(trueMedia().size(), 50U);
 }

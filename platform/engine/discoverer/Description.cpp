@@ -12,6 +12,7 @@ extern "C" {
 #include "discoverer/MediaTypes.h"
 #include "discoverer/TagText.h"
 #include "probe/Completion.h"
+#include "probe/Duration.h"
 #include "text/Text.h"
 
 namespace discoverer {
@@ -160,7 +161,9 @@ private:
     void shareBitRate() {
         const bool alone = mInfo.videoCount + mInfo.audioCount == 1 && !mFile.isPicture();
         int& rate = mInfo.videoCount == 1 ? mInfo.video.bitRate : mInfo.audio.front().bitRate;
-        if (alone && rate == 0 && mInfo.system.duration > 0)
+        // A frame's rate is not that of all of them.
+        const bool isGuessed = probe::isBareSound(mFile.formatName()) && mContext.duration <= 0;
+        if (alone && (rate == 0 || isGuessed) && mInfo.system.duration > 0)
             rate = toInt(av_rescale(mFile.size(), 8'000'000'000, mInfo.system.duration));
     }
 

@@ -53,6 +53,12 @@ bool tellsAacFormat(const AVCodecParameters& stream) {
            stream.ch_layout.nb_channels > 0;
 }
 
+AVCodecID layerOfMpeg(const AVPacket& packet) {
+    constexpr AVCodecID kLayers[] = {AV_CODEC_ID_MP3, AV_CODEC_ID_MP3, AV_CODEC_ID_MP2,
+                                     AV_CODEC_ID_MP1}; // by the header's code, of which 0 is none
+    return packet.size > 1 ? kLayers[packet.data[1] >> 1 & 3] : AV_CODEC_ID_MP3;
+}
+
 AVPixelFormat pixelFormatOfVp9(const AVPacket& packet) {
     // Two bits that mark a frame, and the profile: 0 has eight bits and this subsampling only.
     constexpr int kMarkAndProfile = 0xf0;

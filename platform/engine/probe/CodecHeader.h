@@ -14,6 +14,9 @@ void readLossless(AVCodecParameters& stream);
 /** Whether an AAC header is all there is to know: no extension can double channels or rate. */
 bool tellsAacFormat(const AVCodecParameters& stream);
 
+/** Which layer a packet of MPEG sound belongs to, for demuxers that call all of them the third. */
+AVCodecID layerOfMpeg(const AVPacket& packet);
+
 /** The pixel format of a VP9 key frame, AV_PIX_FMT_NONE when it has to be decoded. */
 AVPixelFormat pixelFormatOfVp9(const AVPacket& packet);
 

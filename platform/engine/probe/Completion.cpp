@@ -106,6 +106,8 @@ void completeFrom(const AVPacket& packet, AVStream& stream) {
     AVCodecParameters& known = *stream.codecpar;
     if (isVideo(stream))
         parse(packet, known);
+    if (known.codec_id == AV_CODEC_ID_MP3)
+        known.codec_id = layerOfMpeg(packet);
     if (known.codec_id == AV_CODEC_ID_VP9 && known.format == AV_PIX_FMT_NONE)
         known.format = pixelFormatOfVp9(packet);
     if (!isKnown(stream) || hidesItsFormat(known))
