@@ -11,15 +11,17 @@
 #include "tests/daemon/support/DaemonTest.h"
 #include "tests/daemon/support/SampleMedia.h"
 
-/** The tool against the daemon with the engine that plays. */
+/** The tool against the daemon with the engine that plays, as the service unit starts it. */
 class ToolTest : public DaemonTest {
 protected:
     void SetUp() override {
-        start(DaemonOptions{});
+        DaemonOptions options;
+        options.arguments = {"--reconnect-clients"};
+        start(options);
         ASSERT_TRUE(mpDaemon->waitUntilServing()) << mpDaemon->output().joined();
     }
 
-    /** Puts an identity before the arguments: the daemon serves each of them once. */
+    /** Puts an identity before the arguments that no tool of the test had before. */
     std::vector<std::string> withIdentity(std::vector<std::string> arguments) {
         arguments.insert(arguments.begin(), {"--identity", std::to_string(mNextIdentity++)});
         return arguments;
