@@ -41,7 +41,7 @@ ImportOutcomes::ImportOutcomes(const std::vector<ImportFile>& files, const std::
     : mFiles(files), mFolder(normalFolder(folder)), mOutcomes(files.size()) {
     for (std::size_t index = 0; index < files.size(); ++index) {
         const ImportFile& file = files[index];
-        mByName.emplace(mFolder.empty() ? file.real : lastName(file.real), index);
+        mByName.emplace(nameOf(file.real), index);
         mByPath.emplace(file.path, index);
         mByPath.emplace(file.real, index);
     }
@@ -73,17 +73,25 @@ void ImportOutcomes::settle(std::size_t index, int result, const std::string& te
     outcome = {true, result, text};
 }
 
-/** A path that is told again is the same import; and of several that fit it is the oldest. */
+/** What a file and what becomes of it have in common. */
+std::string ImportOutcomes::nameOf(const std::string& path) const {
+    return mFolder.empty() ? path : withoutNumber(lastName(path));
+}
+
+bool ImportOutcomes::isAmbiguous(std::size_t index) const {
+    return mByName.find(nameOf(mFiles[index].real))->second != index;
+}
+
+/** A path that is told again is the same import. */
 std::size_t ImportOutcomes::importedAs(const std::string& path) {
-    if (mTold.count(path) != 0)
+    const bool isThere =
+        mFolder.empty() || endsWith(path.substr(0, path.rfind('/')), "/" + mFolder);
+    if (!isThere || mTold.count(path) != 0)
         return kNone;
-    std::size_t index = kNone;
-    if (mFolder.empty()) {
-        index = firstOpen(path);
-    } else if (endsWith(path.substr(0, path.rfind('/')), "/" + mFolder)) {
-        const std::string name = lastName(path);
-        index = std::min(firstOpen(name), firstOpen(withoutNumber(name)));
-    }
+    std::size_t index = firstOpen(nameOf(path));
+    if (mOneByOne)
+        index =
+            mCurrent != kNone && nameOf(mFiles[mCurrent].real) == nameOf(path) ? mCurrent : kNone;
     if (index != kNone)
         mTold.insert(path);
     return index;

@@ -31,14 +31,11 @@ public:
     void setCurrent(std::size_t index) { mCurrent = index; }
     void setNoCurrent() { mCurrent = kNone; }
 
-    /**
-     * From now on one file at a time is asked for: what was told before may be told again, and
-     * what names no file is of the current one.
-     */
-    void beginOneByOne() {
-        mOneByOne = true;
-        mTold.clear();
-    }
+    /** Whether what is told of it cannot be told apart from what is told of an earlier one. */
+    [[nodiscard]] bool isAmbiguous(std::size_t index) const;
+
+    /** From now on one file at a time is asked for: what names no other file is of the current. */
+    void beginOneByOne() { mOneByOne = true; }
 
     /** The daemon tells something. */
     void tell(const qnsmedia::ImportNotification& notification);
@@ -54,6 +51,7 @@ private:
 
     [[nodiscard]] std::size_t importedAs(const std::string& path);
     [[nodiscard]] std::size_t namedIn(const std::string& message) const;
+    [[nodiscard]] std::string nameOf(const std::string& path) const;
     [[nodiscard]] std::size_t firstOpen(const std::string& name) const;
 
     const std::vector<ImportFile>& mFiles;

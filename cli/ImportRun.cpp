@@ -60,18 +60,19 @@ std::chrono::milliseconds ImportRun::elapsed() const {
 
 void ImportRun::sendAll() {
     for (std::size_t index = 0; index < mFiles.size() && mSignal == 0; ++index)
-        send(index);
+        if (!mOutcomes.isAmbiguous(index))
+            send(index);
     mOutcomes.setNoCurrent();
     waitUntil([this] { return allKnown() || isQuiet(); });
 }
 
 /** Nobody else's imports are mistaken for it when it is the only one. */
 void ImportRun::sendOpenOnes() {
+    mOutcomes.beginOneByOne();
     for (std::size_t index = 0; index < mFiles.size() && mSignal == 0; ++index) {
         const auto isKnown = [&] { return mOutcomes.of(index).known; };
         if (isKnown())
             continue;
-        mOutcomes.beginOneByOne();
         send(index);
         if (waitUntil([&] { return isKnown() || isQuiet(); }) && !isKnown())
             mOutcomes.settle(index, kUnknownResult, "the daemon did not tell what became of it");

@@ -14,8 +14,8 @@ namespace {
 /** The daemon holds its locks for moments only. */
 constexpr int kBusyMilliseconds = 5000;
 
-/** The one version whose tables are known here. */
-constexpr int kVersion = 1;
+/** "QNSM". Whatever the version: later ones only add to what is read here. */
+constexpr int kApplicationId = 0x514e534d;
 
 const std::string kColumns = "media.id, media.path, media.source, media.size, media.imported,"
                              " media.duration, media.title, media.artist, media.album";
@@ -44,8 +44,8 @@ std::string searchExpression(const std::string& words) {
 
 LibraryReader::LibraryReader(const std::string& file) try
     : mDatabase(file, SQLite::OPEN_READONLY, kBusyMilliseconds) {
-    if (mDatabase.execAndGet("PRAGMA user_version").getInt() != kVersion)
-        throw SQLite::Exception("it is of another version");
+    if (mDatabase.execAndGet("PRAGMA application_id").getInt() != kApplicationId)
+        throw SQLite::Exception("it is no media library");
 } catch (const SQLite::Exception& exception) {
     throw SQLite::Exception("the media library cannot be read: " + file + ": " + exception.what());
 }

@@ -78,8 +78,8 @@ TEST_F(Outcomes, OfCopiesAreToldByTheNamesInTheFolder) {
     outcomes.tell(finished(0, "/data/media/music/song (x).mp3"));
     outcomes.tell(finished(0, "/data/media/music/song ().mp3"));
     EXPECT_EQ(outcomes.knownCount(), 1U);
-    outcomes.tell(finished(0, "/data/media/music/song (2).mp3"));
-    EXPECT_EQ(outcomes.of(1).text, "/data/media/music/song (2).mp3");
+    outcomes.tell(finished(0, "/data/media/music/film (2)"));
+    EXPECT_EQ(outcomes.of(2).text, "/data/media/music/film (2)");
 }
 
 TEST_F(Outcomes, WithoutANameAreThoseOfTheFileOnItsWay) {
@@ -97,12 +97,17 @@ TEST_F(Outcomes, WithoutANameAreThoseOfTheFileOnItsWay) {
     EXPECT_EQ(outcomes.knownCount(), 1U);
 }
 
-TEST_F(Outcomes, MayBeToldAgainWhenAFileIsAskedForAgain) {
+TEST_F(Outcomes, OfFilesOfOneNameAreToldApartOneByOne) {
     ImportOutcomes outcomes(mFiles, "music");
+    EXPECT_FALSE(outcomes.isAmbiguous(0));
+    EXPECT_TRUE(outcomes.isAmbiguous(1));
     outcomes.tell(finished(0, "/data/media/music/song.mp3"));
     outcomes.beginOneByOne();
+    outcomes.setCurrent(1);
     outcomes.tell(finished(0, "/data/media/music/song.mp3"));
-    EXPECT_EQ(outcomes.knownCount(), 2U);
+    EXPECT_EQ(outcomes.knownCount(), 1U) << "it is the first one's";
+    outcomes.tell(finished(0, "/data/media/music/song (2).mp3"));
+    EXPECT_EQ(outcomes.of(1).text, "/data/media/music/song (2).mp3");
 }
 
 TEST_F(Outcomes, WithAnotherNameAreThoseOfTheOnlyFileThatIsAskedFor) {
