@@ -15,6 +15,7 @@ struct Options {
 };
 
 /** The subcommands. Each adds its rows to the report and returns the exit status. */
+int runImport(const Options& options, Report& report);
 int runMedia(const Options& options, Report& report);
 int runPack(const Options& options, Report& report);
 int runPlayer(const Options& options, Report& report);

@@ -16,6 +16,8 @@ struct Bench {
 };
 
 constexpr Bench kBenches[] = {
+    {"import", "import thousands of files and search them, beside MPD and minidlna",
+     bench::runImport},
     {"media", "read and draw files, beside the libraries and commands that do", bench::runMedia},
     {"pack", "encode and decode every value form, beside msgpack-c", bench::runPack},
     {"player", "open, seek, close and loop real files, beside libmpv", bench::runPlayer},

@@ -50,4 +50,13 @@ ProcessUse readProcessUse(pid_t pid) {
     return use;
 }
 
+double readPeakMegabytes(pid_t pid) {
+    const std::filesystem::path process = "/proc/" + std::to_string(pid);
+    double sum = static_cast<double>(numberBehind(process / "status", "VmHWM:")) / 1024.0;
+    std::ifstream children(process / "task" / std::to_string(pid) / "children");
+    for (pid_t child = 0; children >> child;)
+        sum += readPeakMegabytes(child);
+    return sum;
+}
+
 } // namespace bench

@@ -15,4 +15,7 @@ struct ProcessUse {
 
 ProcessUse readProcessUse(pid_t pid);
 
+/** The most memory that was resident at once, of the process and of its children, in sum. */
+double readPeakMegabytes(pid_t pid);
+
 } // namespace bench

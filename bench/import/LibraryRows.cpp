@@ -1,0 +1,152 @@
+// SPDX-License-Identifier: MIT
+#include "bench/import/LibraryRows.h"
+
+#include <algorithm>
+#include <chrono>
+#include <filesystem>
+#include <functional>
+#include <stdexcept>
+#include <string>
+#include <unistd.h>
+
+#include "library/Database.h"
+
+namespace bench {
+namespace {
+
+namespace fs = std::filesystem;
+using Clock = std::chrono::steady_clock;
+
+constexpr int kLargest = 100'000;
+constexpr int kBatch = 128; // as many as the importer commits together
+
+double milliseconds(const std::function<void()>& work) {
+    const auto begin = Clock::now();
+    work();
+    return std::chrono::duration<double, std::milli>(Clock::now() - begin).count();
+}
+
+std::wstring syllable(unsigned number) {
+    constexpr wchar_t kFirst[] = L"bdfglmrs";
+    constexpr wchar_t kMiddle[] = L"aeio";
+    constexpr wchar_t kLast[] = L"nt";
+    return {kFirst[number % 8], kMiddle[number / 8 % 4], kLast[number / 32 % 2]};
+}
+
+/** A word of a vocabulary of four thousand, as titles have them. */
+std::wstring word(unsigned number) {
+    number = number * 2654435761U >> 20;
+    return syllable(number % 64) + syllable(number / 64);
+}
+
+library::MediaRecord recordOf(int number) {
+    const auto seed = static_cast<unsigned>(number);
+    library::MediaRecord record;
+    record.path = "/media/music/" + std::to_string(number / 10) + "/" + std::to_string(number);
+    record.source = record.path;
+    record.size = 5'000'000 + number;
+    record.modified = number;
+    record.imported = number;
+    auto& info = record.info;
+    info.system.mediaType = "audio/mpeg";
+    info.system.tags = L"TITLE=" + word(seed) + L" " + word(seed / 3 + 7) + L" " + word(seed * 5) +
+                       L"\nARTIST=" + word(seed / 50) + L" " + word(seed / 50 + 1) + L"\nALBUM=" +
+                       word(seed / 10 + 3) + L"\nDATE=2001\nGENRE=Folk\nTRACKNUMBER=" +
+                       std::to_wstring(number % 10) + L"\n";
+    info.system.duration = 200'000'000'000;
+    info.audioCount = 1;
+    info.audio[0].mediaType = "audio/mpeg";
+    info.audio[0].description = L"MP3 (MPEG audio layer 3)";
+    return record;
+}
+
+class GrowingLibrary {
+public:
+    explicit GrowingLibrary(const fs::path& file) : mDatabase(file.string()) {}
+
+    /** Returns what a row has cost, in milliseconds. */
+    double growTo(int size) {
+        const int begin = mSize;
+        const double spent = milliseconds([&] {
+            while (mSize < size)
+                addBatch(std::min(size, mSize + kBatch));
+        });
+        return spent / (size - begin);
+    }
+
+private:
+    void addBatch(int end) {
+        library::Database::Transaction transaction(mDatabase);
+        for (; mSize < end; ++mSize)
+            mDatabase.put(recordOf(mSize));
+        transaction.commit();
+    }
+
+    library::Database mDatabase;
+    int mSize = 0;
+};
+
+Row measureGrowth(GrowingLibrary& library, int rounds) {
+    Row row{"a row, with so many there", "ms", {}};
+    for (const int size : {1'000, 3'000, 10'000, 30'000, kLargest}) {
+        library.growTo(size - rounds * 2 * kBatch);
+        std::vector<double> samples;
+        for (int left = rounds - 1; left >= 0; --left)
+            samples.push_back(library.growTo(size - left * 2 * kBatch));
+        row.entries.push_back({std::to_string(size), summarize(std::move(samples))});
+    }
+    return row;
+}
+
+void countRows(const SQLite::Database& database, const std::string& query) {
+    SQLite::Statement rows(database, query);
+    int count = 0;
+    while (rows.executeStep())
+        ++count;
+    if (count == 0)
+        throw std::runtime_error("nothing is found: " + query);
+}
+
+Row measureSearch(const fs::path& file, int rounds) {
+    struct Search {
+        const char* name;
+        const char* words;
+        const char* order;
+    };
+    constexpr Search kSearches[] = {
+        {"a word", "latdon", "ORDER BY rank"},
+        {"two words", "latdon gen*", "ORDER BY rank"},
+        {"3 letters", "lat*", "ORDER BY rank"},
+        {"2 letters", "la*", "ORDER BY rank"},
+        {"2, unranked", "la*", ""},
+    };
+    const SQLite::Database database(file.string());
+    Row row{"search in 100,000, best 50", "ms", {}};
+    for (const Search& search : kSearches) {
+        const std::string query = std::string("SELECT media.id, media.title FROM media_search('") +
+                                  search.words + "') JOIN media ON media.id = media_search.rowid " +
+                                  search.order + " LIMIT 50";
+        std::vector<double> samples;
+        for (int round = 0; round < rounds * 10; ++round)
+            samples.push_back(milliseconds([&] { countRows(database, query); }));
+        row.entries.push_back({search.name, summarize(std::move(samples))});
+    }
+    return row;
+}
+
+} // namespace
+
+void measureLibraryRows(int rounds, Report& report) {
+    const fs::path folder =
+        fs::temp_directory_path() / ("qnsmedia-bench-rows-" + std::to_string(::getpid()));
+    fs::create_directories(folder);
+    const fs::path file = folder / "media.db";
+    {
+        GrowingLibrary library(file);
+        report.add(measureGrowth(library, std::min(rounds, 3)));
+    }
+    report.add(measureSearch(file, rounds));
+    fs::remove_all(folder);
+}
+
+} // namespace bench
