@@ -30,6 +30,8 @@ int infoCommand(const qnsmedia::Connection::Options& options, const std::vector<
                 bool json);
 int imageCommand(const qnsmedia::Connection::Options& options, const ImageRequest& request);
 int extensionsCommand(const qnsmedia::Connection::Options& options, bool json);
+int monitorCommand(const qnsmedia::Connection::Options& options, bool json);
+int powerOffCommand(const qnsmedia::Connection::Options& options, bool ask);
 int importCommand(const qnsmedia::Connection::Options& options, const ImportRequest& request);
 
 /** Those that read the library's database also throw SQLite::Exception. */

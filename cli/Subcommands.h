@@ -19,5 +19,7 @@ void addStatus(CLI::App& app, const Options& options, Command& command);
 void addInfo(CLI::App& app, const Options& options, Command& command);
 void addImage(CLI::App& app, const Options& options, Command& command);
 void addExtensions(CLI::App& app, const Options& options, Command& command);
+void addMonitor(CLI::App& app, const Options& options, Command& command);
+void addPowerOff(CLI::App& app, const Options& options, Command& command);
 void addImport(CLI::App& app, const Options& options, Command& command);
 void addLibrary(CLI::App& app, Command& command);

@@ -61,6 +61,8 @@ int main(int argc, char** argv) {
     addExtensions(app, options, command);
     addImport(app, options, command);
     addLibrary(app, command);
+    addMonitor(app, options, command);
+    addPowerOff(app, options, command);
 
     try {
         app.parse(argc, argv);

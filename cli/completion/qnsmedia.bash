@@ -48,14 +48,15 @@ _qnsmedia() {
         if [[ ${COMP_WORDS[COMP_CWORD]} == -* ]]; then
             _qnsmedia_words '-h --help --version --identity --timeout'
         else
-            _qnsmedia_words 'play status info image extensions import library'
+            _qnsmedia_words 'play status info image extensions import library monitor poweroff'
         fi
         ;;
     play:*) _qnsmedia_options_or_files '-h --help' ;;
-    status:* | extensions:*) _qnsmedia_words '-h --help --json' ;;
+    status:* | extensions:* | monitor:*) _qnsmedia_words '-h --help --json' ;;
     info:*) _qnsmedia_options_or_files '-h --help --json' ;;
     image:*) _qnsmedia_options_or_files '-h --help -o --output --at --size' ;;
     import:*) _qnsmedia_options_or_files '-h --help --to --json' ;;
+    poweroff:*) _qnsmedia_words '-h --help -y --yes' ;;
     library:*)
         if [[ ${COMP_WORDS[COMP_CWORD]} == -* ]]; then
             _qnsmedia_words '-h --help --database'

@@ -40,9 +40,11 @@ complete -c qnsmedia -n $start -a extensions -d 'Tell which files the daemon can
 
 complete -c qnsmedia -n $start -a import -d 'Take files into the media library'
 complete -c qnsmedia -n $start -a library -d 'Read the media library'
+complete -c qnsmedia -n $start -a monitor -d 'Tell everything that the daemon notifies'
+complete -c qnsmedia -n $start -a poweroff -d 'End the daemon'
 
 complete -c qnsmedia -n '__qnsmedia_in play info image import "library show"' -F
-complete -c qnsmedia -n '__qnsmedia_in status info extensions import' -l json -d 'For programs'
+complete -c qnsmedia -n '__qnsmedia_in status info extensions import monitor' -l json -d 'For programs'
 complete -c qnsmedia -n '__qnsmedia_in image' -s o -l output -rF -d 'File to write'
 complete -c qnsmedia -n '__qnsmedia_in image' -l at -x -d 'Moment, such as 1:23.5 or 50%'
 complete -c qnsmedia -n '__qnsmedia_in image' -l size -x -d 'Width and height, such as 640x360'
@@ -55,3 +57,4 @@ complete -c qnsmedia -n '__qnsmedia_in library' -a show -d 'All that is known of
 complete -c qnsmedia -n '__qnsmedia_in library' -a export -d 'The whole library as JSON'
 set -l reads '"library list" "library search" "library show" "library export"'
 complete -c qnsmedia -n "__qnsmedia_in $reads" -l json -d 'For programs'
+complete -c qnsmedia -n '__qnsmedia_in poweroff' -s y -l yes -d 'Without asking'

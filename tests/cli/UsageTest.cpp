@@ -23,7 +23,8 @@ TEST(ToolUsage, HelpTellsTheCommandsAndTheExitCodes) {
 }
 
 TEST(ToolUsage, EveryCommandHasHelp) {
-    for (const char* command : {"play", "status"}) {
+    for (const char* command :
+         {"play", "status", "info", "image", "extensions", "import", "monitor", "poweroff"}) {
         Tool tool({command, "--help"});
         EXPECT_EQ(tool.waitForExit(), 0);
         EXPECT_THAT(tool.output(), HasSubstr("Example: qnsmedia " + std::string(command)));
