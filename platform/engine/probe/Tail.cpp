@@ -45,8 +45,9 @@ std::optional<std::int64_t> timeOfCluster(std::string_view bytes) {
         bytes.remove_prefix(std::min(kChecksumSize, bytes.size()));
     if (bytes.size() < 2 || bytes[0] != '\xe7')
         return std::nullopt;
-    const std::size_t size = static_cast<unsigned char>(bytes[1]) & 0x7fU;
-    if (bytes[1] >= 0 || size > 7 || bytes.size() < size + 2)
+    // The first bit tells that the number has one byte; without it, the result is too large.
+    const std::size_t size = static_cast<unsigned char>(bytes[1]) ^ 0x80U;
+    if (size > 7 || bytes.size() < size + 2)
         return std::nullopt;
     std::int64_t time = 0;
     for (const char byte : bytes.substr(2, size))
