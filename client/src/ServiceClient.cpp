@@ -55,8 +55,9 @@ int ServiceClient::registerCallBack() const {
     } catch (const TimedOut&) {
         throw TimedOut("the daemon gave no answer to the registration of identity " +
                        std::to_string(mpLink->identity()) +
-                       "; it connects to each identity only once in its life, and another process "
-                       "may have used this one before");
+                       "; unless it was started with --reconnect-clients it connects to each "
+                       "identity only once in its life, and another process may have used this "
+                       "one before");
     }
 }
 

@@ -33,8 +33,8 @@ public:
 
     /**
      * Registers with the daemon and waits until it has given an id. Throws as the futures do.
-     * A daemon connects to each identity only once in its life; a process that uses an identity
-     * after another one gets no answer, and TimedOut.
+     * A daemon that was not started with --reconnect-clients connects to each identity only once
+     * in its life; a process that uses an identity after another one gets no answer, and TimedOut.
      */
     explicit Player(Connection& connection);
 
