@@ -14,12 +14,6 @@ namespace {
 constexpr std::int32_t kPlaying = 3;
 constexpr std::int64_t kImportFinished = 2;
 
-#if defined(__SANITIZE_ADDRESS__) || defined(__SANITIZE_THREAD__)
-constexpr bool kMemoryTells = false; // what is freed is kept for a while, to be looked at
-#else
-constexpr bool kMemoryTells = true;
-#endif
-
 class KilledClients : public LivesTest {
 protected:
     /** Draws a picture as a new process with the identity that was the killed one's. */
@@ -155,12 +149,8 @@ TEST_F(AThousandLives, OfOneIdentityAreAllServedAndLeaveNothingBehind) {
         live(number);
     EXPECT_LE(mpDaemon->descriptorCount(), descriptors);
     EXPECT_LE(mpDaemon->threadCount(), threads);
-    const auto grown = static_cast<long>(mpDaemon->residentBytes() - memory);
-    RecordProperty("grown", std::to_string(grown));
     // Less than the five proxies of every life need.
-    if (kMemoryTells) {
-        EXPECT_LT(grown, 100 * kLives);
-    }
+    EXPECT_LT(memoryGrownSince(*mpDaemon, memory), 100 * kLives);
 }
 
 } // namespace
