@@ -81,4 +81,32 @@ TEST_F(Examples, TheShortestProgramPlaysAFileToItsEnd) {
     EXPECT_TRUE(mpDaemon->waitForLine("MediaPlayerController::play"));
 }
 
+TEST_F(Examples, AnotherTellsWhatAFileIsAndDrawsIt) {
+    const std::string picture =
+        testing::TempDir() + "/qns-example-" + std::to_string(::getpid()) + ".png";
+    Tool tool(QNS_EXAMPLE_DESCRIBE, {sample::film(), picture}, Tool::Output::pipe);
+    EXPECT_EQ(tool.waitForExit(), 0) << tool.errors();
+    EXPECT_THAT(tool.output(), testing::StartsWith("TITLE: A film\n"));
+    EXPECT_THAT(tool.output(), HasSubstr(", 320x180\nAAC"));
+    EXPECT_TRUE(std::filesystem::remove(picture));
+}
+
+TEST_F(Examples, AnotherCopiesAFileIntoTheLibrary) {
+    Tool tool(QNS_EXAMPLE_IMPORT, {sample::film(), "films"}, Tool::Output::pipe);
+    EXPECT_EQ(tool.waitForExit(), 0) << tool.errors();
+    EXPECT_THAT(tool.output(), testing::EndsWith("/media/films/film.mp4\n"));
+}
+
+TEST_F(Examples, TheySayWhatCannotBeDone) {
+    Tool describe(QNS_EXAMPLE_DESCRIBE, {sample::noise(), "/p.png"}, Tool::Output::pipe);
+    EXPECT_EQ(describe.waitForExit(), 1);
+    EXPECT_THAT(describe.errors(), HasSubstr("not media"));
+}
+
+TEST_F(Examples, TheySayWhatCannotBeImported) {
+    Tool import(QNS_EXAMPLE_IMPORT, {"/no/such", "films"}, Tool::Output::pipe);
+    EXPECT_EQ(import.waitForExit(), 1);
+    EXPECT_EQ(import.errors(), "not found\n");
+}
+
 } // namespace
