@@ -65,7 +65,8 @@ INSTANTIATE_TEST_SUITE_P(Engine, SignatureOf, testing::ValuesIn(trueMedia()),
 TEST(Signature, IsThereForWhatMostFilesAre) {
     for (const char* const name :
          {"h264.mp4", "h264.mkv", "vp9.webm", "mpeg4.avi", "h264.ts", "tagged.mp3", "constant.mp3",
-          "headless.mp3", "cover.mp3", "cd.flac", "pcm.wav", "vorbis.ogg", "bare.aac", "glass.png"})
+          "headless.mp3", "cover.mp3", "cd.flac", "pcm.wav", "vorbis.ogg", "bare.aac", "bare.ac3",
+          "glass.png"})
         EXPECT_NE(signatureOf(beginningOf(truthPath(name))), "") << name;
 }
 

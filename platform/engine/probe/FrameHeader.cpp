@@ -45,6 +45,7 @@ constexpr int kAc3BitRates[] = {32,  40,  48,  56,  64,  80,  96,  112, 128, 160
                                 192, 224, 256, 320, 384, 448, 512, 576, 640};
 
 constexpr int kAc3Block = 256;
+constexpr unsigned int kLastOfAc3 = 10; // version
 constexpr unsigned int kLaterKinds = 1U << 16;
 
 struct MpegVersion {
@@ -65,11 +66,15 @@ std::optional<MpegVersion> mpegVersion(unsigned int code) {
     }
 }
 
+unsigned int ac3Version(const Bits& bits) {
+    return bits.get(40, 5);
+}
+
 std::optional<FrameHeader> readFirstAc3(const Bits& bits) {
     constexpr unsigned int kUsual = 8; // later ones halve the rate
     const unsigned int rate = bits.get(32, 2);
     const unsigned int size = bits.get(34, 6);
-    const unsigned int version = bits.get(40, 5);
+    const unsigned int version = ac3Version(bits);
     if (rate >= std::size(kAc3Rates) || size / 2 >= std::size(kAc3BitRates))
         return std::nullopt;
     FrameHeader header;
@@ -141,13 +146,15 @@ std::optional<FrameHeader> readAdtsHeader(std::string_view bytes) {
 
 std::optional<FrameHeader> readAc3Header(std::string_view bytes) {
     constexpr unsigned int kSync = 0x0b77;
-    constexpr unsigned int kLastOfFirst = 10;
     constexpr unsigned int kLast = 16;
     const Bits bits(bytes);
-    const unsigned int version = bits.get(40, 5);
-    if (bytes.size() < kLongestHeader || bits.get(0, 16) != kSync || version > kLast)
+    if (bytes.size() < kLongestHeader || bits.get(0, 16) != kSync || ac3Version(bits) > kLast)
         return std::nullopt;
-    return version <= kLastOfFirst ? readFirstAc3(bits) : readLaterAc3(bits);
+    return ac3Version(bits) <= kLastOfAc3 ? readFirstAc3(bits) : readLaterAc3(bits);
+}
+
+bool isEnhancedAc3(std::string_view header) {
+    return ac3Version(Bits(header)) > kLastOfAc3;
 }
 
 } // namespace probe

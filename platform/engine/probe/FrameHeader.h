@@ -26,4 +26,7 @@ ReadHeader readMpegHeader; ///< layers I to III of MPEG-1 and -2
 ReadHeader readAdtsHeader;
 ReadHeader readAc3Header; ///< AC-3 and E-AC-3
 
+/** Which of the two it is. */
+bool isEnhancedAc3(std::string_view header);
+
 } // namespace probe

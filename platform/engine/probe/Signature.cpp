@@ -121,6 +121,8 @@ const char* formatBySignature(std::string_view head) {
         return "mp3";
     if (isSound(head, readAdtsHeader))
         return "aac";
+    if (isSound(head, readAc3Header))
+        return isEnhancedAc3(head) ? "eac3" : "ac3";
     return kindOfPng(head);
 }
 
