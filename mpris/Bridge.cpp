@@ -46,7 +46,7 @@ int Bridge::run() {
 /** Null when there is no daemon and one is waited for. */
 std::unique_ptr<Session> Bridge::connect() {
     try {
-        return std::make_unique<Session>(mLoop, *mpBus, mOptions.connection);
+        return std::make_unique<Session>(mLoop, *mpBus, mOptions);
     } catch (const qnsmedia::DaemonNotRunning&) {
         if (!mOptions.wait)
             throw;

@@ -6,21 +6,14 @@
 #include <sdbus-c++/IConnection.h>
 
 #include "cli/EventLoop.h"
+#include "mpris/Options.h"
 #include "mpris/Session.h"
-#include "qnsmedia/Connection.h"
 
 namespace mpris {
 
 /** Shows the daemon's player on the session bus until something ends that. For one thread. */
 class Bridge {
 public:
-    struct Options {
-        qnsmedia::Connection::Options connection;
-
-        /** Waits for a daemon, at first and when one has gone, instead of ending. */
-        bool wait = false;
-    };
-
     /** Throws std::runtime_error without a bus. */
     explicit Bridge(const Options& options);
 

@@ -19,17 +19,16 @@ constexpr auto kStatusTick = 1s;
 
 } // namespace
 
-Session::Session(EventLoop& loop, sdbus::IConnection& bus,
-                 const qnsmedia::Connection::Options& options)
+Session::Session(EventLoop& loop, sdbus::IConnection& bus, const Options& options)
     : mBus(bus),
       mHandover(loop),
-      mConnection(options),
+      mConnection(options.connection),
       mPlayer(mConnection),
       mControls(mPlayer, mModel, mHandover, [this] { show(); }),
       mpObject(sdbus::createObject(bus, kObjectPath)),
       mRoot(*mpObject),
       mInterface(*mpObject, mControls, [this] { return mModel.position(Clock::now()); }),
-      mReader(mConnection, mHandover, listener()) {
+      mReader(mConnection, mHandover, options.pictures, listener()) {
     mPlayer.onNotification(mHandover.to<qnsmedia::PlayerNotification>(
         [this](const auto& notification) { notified(notification); }));
     mConnection.onLost(mHandover.to([] {})); // only ends the loop's wait

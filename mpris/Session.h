@@ -9,6 +9,7 @@
 
 #include "cli/EventLoop.h"
 #include "mpris/Handover.h"
+#include "mpris/Options.h"
 #include "mpris/PlayerControls.h"
 #include "mpris/PlayerInterface.h"
 #include "mpris/PlayerModel.h"
@@ -26,7 +27,7 @@ namespace mpris {
 class Session {
 public:
     /** Throws qnsmedia::Error, sdbus::Error, std::runtime_error when another has the name. */
-    Session(EventLoop& loop, sdbus::IConnection& bus, const qnsmedia::Connection::Options& options);
+    Session(EventLoop& loop, sdbus::IConnection& bus, const Options& options);
     ~Session();
     Session(const Session&) = delete;
     Session& operator=(const Session&) = delete;

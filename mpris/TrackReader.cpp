@@ -24,13 +24,20 @@ std::optional<std::string> fileOf(const std::string& path) {
 } // namespace
 
 TrackReader::TrackReader(qnsmedia::Connection& connection, const Handover& handover,
-                         Listener listener)
-    : mHandover(handover), mListener(std::move(listener)), mDiscoverer(connection) {
+                         const std::string& pictureFolder, Listener listener)
+    : mHandover(handover),
+      mListener(std::move(listener)),
+      mFolder(pictureFolder),
+      mDiscoverer(connection) {
     mDiscoverer.extensions(mHandover.to<std::exception_ptr, std::vector<std::string>>(
         [this](const std::exception_ptr& error, const std::vector<std::string>& extensions) {
             if (!error)
                 mListener.extensions(extensions);
         }));
+}
+
+TrackReader::~TrackReader() {
+    mFolder.remove(mPictured);
 }
 
 void TrackReader::read(const Track& track) {

@@ -30,7 +30,11 @@ public:
     };
 
     /** Throws as qnsmedia::Discoverer and PictureFolder do. */
-    TrackReader(qnsmedia::Connection& connection, const Handover& handover, Listener listener);
+    TrackReader(qnsmedia::Connection& connection, const Handover& handover,
+                const std::string& pictureFolder, Listener listener);
+    ~TrackReader();
+    TrackReader(const TrackReader&) = delete;
+    TrackReader& operator=(const TrackReader&) = delete;
 
     /** Reads this track next; one that has not begun until then is left out. */
     void read(const Track& track);

@@ -21,7 +21,7 @@ int tell(const std::exception& error, int code) {
     return code;
 }
 
-int run(const mpris::Bridge::Options& options) {
+int run(const mpris::Options& options) {
     try {
         return exitCodeOfSignal(mpris::Bridge(options).run());
     } catch (const qnsmedia::DaemonNotRunning& error) {
@@ -43,12 +43,16 @@ int main(int argc, char** argv) {
     app.footer(kFooter);
     app.set_version_flag("--version", "qnsmedia-mpris " QNS_VERSION);
 
-    mpris::Bridge::Options options;
+    mpris::Options options;
     app.add_option("--identity", options.connection.identity,
                    "Identity to use, instead of the first free")
         ->check(CLI::Range(1000, 1007));
     app.add_flag("--wait", options.wait,
                  "Wait for the daemon, also after it has ended, instead of ending too");
+    app.add_option("--pictures", options.pictures,
+                   "Folder for pictures, which the daemon can write to and desktops can read;\n"
+                   "without it one that is made for them")
+        ->check(CLI::ExistingDirectory);
     try {
         app.parse(argc, argv);
     } catch (const CLI::ParseError& error) {

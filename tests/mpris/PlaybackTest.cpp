@@ -82,9 +82,9 @@ TEST_F(MprisPlayback, IsFollowedByPlayerctl) {
 
 TEST_F(MprisPlayback, ShowsWhatAnotherClientDoes) {
     Tool tool(withIdentity({"play", sample::film()}), Tool::Output::terminal);
+    ASSERT_TRUE(tool.waitFor("playing"));
     EXPECT_TRUE(waitForStatus("Playing"));
     EXPECT_THAT(playerctl({"metadata", "xesam:url"}), HasSubstr("film.mp4"));
-    EXPECT_TRUE(tool.waitFor("playing"));
     tool.press(" ");
     EXPECT_TRUE(waitForStatus("Paused"));
     tool.press("\x1b[C");
@@ -97,8 +97,7 @@ TEST_F(MprisPlayback, ShowsWhatAnotherClientDoes) {
 }
 
 TEST_F(MprisPlayback, ShowsAMediumThatIsOpenAlready) {
-    mBridge->signal(SIGTERM);
-    mBridge->waitForExit();
+    endBridge();
     Tool tool(withIdentity({"play", sample::film()}));
     tool.waitFor("playing  0:01");
     startBridge();

@@ -34,7 +34,8 @@ TEST_F(MprisAlone, ExplainsItself) {
 }
 
 TEST_F(MprisAlone, RefusesWrongUsage) {
-    for (const char* const argument : {"--identity=999", "--identity=1008", "--nothing", "file"})
+    for (const char* const argument :
+         {"--identity=999", "--identity=1008", "--nothing", "file", "--pictures=/no/such/folder"})
         EXPECT_NE(errorsOf({argument}, 2), "") << argument;
 }
 

@@ -61,11 +61,24 @@ TEST_F(MprisTracks, ShowAPictureWhichIsGoneAtTheEnd) {
     std::string begin(2, ' ');
     std::ifstream(path, std::ios::binary).read(begin.data(), 2);
     EXPECT_EQ(begin, "\xFF\xD8") << "a JPEG file";
-    mBridge->signal(SIGTERM);
-    mBridge->waitForExit();
+    endBridge();
     EXPECT_FALSE(fs::exists(path));
     EXPECT_THAT(pictures(), IsEmpty());
-    mBridge.reset();
+}
+
+TEST_F(MprisTracks, HavePicturesWhereTheyAreWanted) {
+    endBridge();
+    const TestFolder folder;
+    startBridge({"--pictures", folder.path("")});
+    play(sample::film());
+    EXPECT_TRUE(mDesktop.waitForMetadata("mpris:artUrl"));
+    EXPECT_EQ(playerctl({"metadata", "mpris:artUrl"}),
+              "file://" + folder.path("qnsmedia-mpris-1.jpg"));
+    EXPECT_TRUE(folder.has("qnsmedia-mpris-1.jpg"));
+    EXPECT_THAT(pictures(), IsEmpty());
+    endBridge();
+    EXPECT_FALSE(folder.has("qnsmedia-mpris-1.jpg"));
+    EXPECT_TRUE(folder.has("")) << "which was there before";
 }
 
 TEST_F(MprisTracks, HaveNoPictureButTheirOwn) {
@@ -75,8 +88,8 @@ TEST_F(MprisTracks, HaveNoPictureButTheirOwn) {
     EXPECT_EQ(mDesktop.get<BusClient::Properties>("Metadata").count("mpris:artUrl"), 0U);
     play(sample::filmWithUnicodeName());
     EXPECT_TRUE(mDesktop.waitForMetadata("mpris:artUrl"));
-    EXPECT_THAT(playerctl({"metadata", "mpris:artUrl"}), EndsWith("/3.jpg"));
-    EXPECT_THAT(pictures(), testing::ElementsAre("3.jpg"));
+    EXPECT_THAT(playerctl({"metadata", "mpris:artUrl"}), EndsWith("/qnsmedia-mpris-3.jpg"));
+    EXPECT_THAT(pictures(), testing::ElementsAre("qnsmedia-mpris-3.jpg"));
 }
 
 TEST_F(MprisTracks, MayHaveAnyName) {

@@ -9,16 +9,20 @@ void MprisTest::SetUp() {
 }
 
 void MprisTest::TearDown() {
-    if (mBridge) {
-        mBridge->signal(SIGTERM);
-        EXPECT_EQ(mBridge->waitForExit(), 128 + SIGTERM) << mBridge->errors();
-    }
+    if (mBridge)
+        endBridge();
     ToolTest::TearDown();
 }
 
 void MprisTest::startBridge(const std::vector<std::string>& arguments) {
     mBridge.emplace(QNS_MPRIS, withIdentity(arguments), Tool::Output::pipe);
     ASSERT_TRUE(mDesktop.waitForName(true)) << mBridge->errors();
+}
+
+void MprisTest::endBridge() {
+    mBridge->signal(SIGTERM);
+    EXPECT_EQ(mBridge->waitForExit(), 128 + SIGTERM) << mBridge->errors();
+    mBridge.reset();
 }
 
 std::string MprisTest::playerctl(std::vector<std::string> arguments) {

@@ -20,6 +20,9 @@ protected:
 
     void startBridge(const std::vector<std::string>& arguments = {});
 
+    /** Ends it with a signal. */
+    void endBridge();
+
     /** Runs it for the player on the bus; returns its output without the last line's end. */
     static std::string playerctl(std::vector<std::string> arguments);
 
