@@ -27,6 +27,13 @@ TEST_F(Arm64, EveryProductIsForThatProcessor) {
             << product;
 }
 
+TEST_F(Arm64, TextsAndNumbersAreTheSameThere) {
+    // Where char and wchar_t have other signs than here. Death tests start their program once more,
+    // which only the emulator could.
+    for (const char* program : {"base_test --gtest_filter=-*DeathTest.*", "pack_test"})
+        EXPECT_THAT(outputOf(emulated(program)), HasSubstr("[  PASSED  ]")) << program;
+}
+
 TEST_F(Arm64, TheDaemonServesTheTool) {
     DaemonOptions options;
     options.program = kEmulator;
