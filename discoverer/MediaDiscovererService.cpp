@@ -204,8 +204,11 @@ void MediaDiscovererService::clientEnded(int iClientID) {
     if (iDiscovererID == DiscovererIds::kNone)
         return;
     // Behind all that the client has asked for, which the main thread may have to do yet.
-    QMetaObject::invokeMethod(
-        this, [this, iDiscovererID] { mIds.takeBack(iDiscovererID); }, Qt::QueuedConnection);
+    QMetaObject::invokeMethod(this, "takeBack", Qt::QueuedConnection, Q_ARG(int, iDiscovererID));
+}
+
+void MediaDiscovererService::takeBack(int iDiscovererID) {
+    mIds.takeBack(iDiscovererID);
 }
 
 void MediaDiscovererService::retOpen(int iRet, int iDiscovererID) {

@@ -61,6 +61,9 @@ protected:
     void clientEnded(int iClientID) override;
 
 private:
+    /** The discoverer has done all that an ended client had asked for. */
+    Q_INVOKABLE void takeBack(int iDiscovererID);
+
     struct Request;
     using Signal = void (MediaDiscovererService::*)(int);
 

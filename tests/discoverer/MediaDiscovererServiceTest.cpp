@@ -170,7 +170,7 @@ TEST_F(DiscovererService, HasItsSignalsAndSlotsInOrder) {
                 ElementsAre("initialize_signal(int)", "open_signal(int)", "close_signal(int)",
                             "getMetadata_signal(int)", "getImage_signal(int)",
                             "getExtensions_signal(int)", "retOpen(int,int)", "retMetadata(int)",
-                            "retImage(int)", "retSupportedExtensions(int)"));
+                            "retImage(int)", "retSupportedExtensions(int)", "takeBack(int)"));
 }
 
 TEST_F(DiscovererService, GivesEachClientAnIdOfItsOwn) {
