@@ -4,7 +4,6 @@
 #include <cstdlib>
 #include <sstream>
 
-using qnsmedia::AudioStream;
 using qnsmedia::Metadata;
 using qnsmedia::Nanoseconds;
 using qnsmedia::VideoStream;
