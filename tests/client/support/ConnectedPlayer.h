@@ -11,6 +11,7 @@
 #include "qnsmedia/Error.h"
 #include "qnsmedia/Player.h"
 #include "tests/client/support/FakeDaemon.h"
+#include "tests/daemon/support/Patience.h"
 
 /** A player of the library, registered with a daemon that the test plays. */
 class ConnectedPlayer : public testing::Test {
@@ -18,7 +19,7 @@ protected:
     /** Long enough for an answer, when one comes, and no burden when the test waits for none. */
     static qnsmedia::Connection::Options shortDeadline() {
         qnsmedia::Connection::Options options;
-        options.deadline = std::chrono::milliseconds(50);
+        options.deadline = patience::stretched(std::chrono::milliseconds(100));
         return options;
     }
 
