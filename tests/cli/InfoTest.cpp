@@ -4,7 +4,7 @@
 
 #include <nlohmann/json.hpp>
 
-#include "tests/cli/support/ToolTest.h"
+#include "tests/cli/support/LibraryTest.h"
 
 using testing::HasSubstr;
 using testing::IsEmpty;
@@ -12,29 +12,7 @@ using testing::StartsWith;
 
 namespace {
 
-class ToolDiscovers : public ToolTest {
-protected:
-    void SetUp() override {
-        ToolTest::SetUp();
-        std::string pattern = testing::TempDir() + "/qns-tool-XXXXXX";
-        mFolder = ::mkdtemp(pattern.data());
-    }
-    void TearDown() override {
-        ToolTest::TearDown();
-        std::filesystem::remove_all(mFolder);
-    }
-
-    /** Runs the tool, which must end with this status, and returns what it has written. */
-    std::string run(std::vector<std::string> arguments, int status = 0) {
-        Tool tool(withIdentity(std::move(arguments)));
-        EXPECT_EQ(tool.waitForExit(), status) << tool.errors();
-        mErrors = tool.errors();
-        return tool.output();
-    }
-
-    std::filesystem::path mFolder;
-    std::string mErrors;
-};
+class ToolDiscovers : public LibraryTest {};
 
 TEST_F(ToolDiscovers, TellsWhatAFileIs) {
     const std::string told = run({"info", sample::film()});
