@@ -5,12 +5,12 @@
 #include <utility>
 
 #include "discoverer/Discoverer.h"
-#include "discoverer/Thumbnail.h"
 #include "handle/Barrier.h"
 #include "importer/Importer.h"
 #include "importer/LookProbe.h"
 #include "importer/Options.h"
 #include "player/Player.h"
+#include "worker/Media.h"
 
 namespace LibMediaPlayer {
 
@@ -29,7 +29,11 @@ IMediaImporter* InterfaceFactory::createImporter() {
         importer::Options options;
         options.dataFolder = importer::dataFolder();
         options.probe = importer::probeByLook;
-        options.drawThumbnail = discoverer::drawThumbnail;
+        // Workers of its own: they run when nothing else does, as the thread that asks them.
+        options.drawThumbnail = [pPool =
+                                     std::make_shared<worker::Pool>()](const std::string& path) {
+            return worker::drawThumbnail(path, *pPool);
+        };
         return std::make_unique<importer::Importer>(std::move(options)).release();
     });
 }

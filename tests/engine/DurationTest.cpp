@@ -42,17 +42,19 @@ protected:
     }
     void TearDown() override { std::filesystem::remove_all(mFolder); }
 
-    [[nodiscard]] MediaFile::Duration of(const std::string& content,
-                                         MediaFile::Bounds bounds = MediaFile::kLook) const {
+    [[nodiscard]] probe::Duration of(const std::string& content,
+                                     MediaFile::Bounds bounds = MediaFile::kLook) const {
         std::ofstream(mFolder / "file", std::ios::binary) << content;
         return ofFile(mFolder / "file", bounds);
     }
 
-    static MediaFile::Duration ofFile(const std::filesystem::path& path, MediaFile::Bounds bounds) {
-        auto opened = MediaFile::open(path, bounds);
+    static probe::Duration ofFile(const std::filesystem::path& path, MediaFile::Bounds bounds) {
+        probe::RegularFile regular;
+        EXPECT_EQ(regular.open(path), 0) << path;
+        auto opened = MediaFile::open(std::move(regular), bounds);
         auto* const pFile = std::get_if<std::unique_ptr<MediaFile>>(&opened);
         EXPECT_TRUE(pFile) << path;
-        return pFile ? (*pFile)->duration() : MediaFile::Duration{};
+        return pFile ? (*pFile)->duration() : probe::Duration{};
     }
 
     std::filesystem::path mFolder;

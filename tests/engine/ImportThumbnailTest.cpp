@@ -10,6 +10,7 @@
 #include "importer/LookProbe.h"
 #include "tests/engine/Samples.h"
 #include "tests/engine/TestImporter.h"
+#include "worker/Media.h"
 
 using namespace LibMediaPlayer;
 using discoverer::Thumbnail;
@@ -260,7 +261,7 @@ TEST_F(ImportThumbnails, ADatabaseThatIsLockedGetsThemLater) {
 
 TEST(ImportOfMediaWithPictures, DrawsThemAndAsksForNoneOfSoundAlone) {
     const TestFolder folder;
-    Artist artist(discoverer::drawThumbnail);
+    Artist artist([](const std::string& path) { return worker::drawThumbnail(path); });
     TestImporter importer(folder / "data", importer::probeByLook, nullptr, artist.draw());
     importer.import(samplePath("sound.mp3"));
     importer.import(samplePath("film.mp4"));

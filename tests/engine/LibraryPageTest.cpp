@@ -9,11 +9,11 @@
 #include <future>
 #include <sstream>
 
-#include "discoverer/Thumbnail.h"
 #include "importer/LookProbe.h"
 #include "tests/engine/CommandOutput.h"
 #include "tests/engine/Samples.h"
 #include "tests/engine/TestImporter.h"
+#include "worker/Media.h"
 
 using namespace LibMediaPlayer;
 namespace fs = std::filesystem;
@@ -74,7 +74,7 @@ protected:
         std::promise<void> drawing;
         TestImporter importer(mData, importer::probeByLook, nullptr, [&](const std::string& path) {
             drawing.set_value();
-            return discoverer::drawThumbnail(path);
+            return worker::drawThumbnail(path);
         });
         import(importer, "sound.mp3", "winter.mp3", "Music",
                "-metadata title='Winter Birds' -metadata artist='Ana Müller' "

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include "probe/MediaLook.h"
+#include "worker/Media.h"
 
 #include <gtest/gtest.h>
 
@@ -7,7 +7,7 @@
 #include "tests/engine/Samples.h"
 
 using namespace LibMediaPlayer;
-using probe::lookAt;
+using worker::lookAt;
 
 namespace {
 

@@ -1,6 +1,4 @@
 // SPDX-License-Identifier: MIT
-#include "discoverer/Thumbnail.h"
-
 #include <gtest/gtest.h>
 
 #include <cstdlib>
@@ -10,9 +8,10 @@
 #include "tests/engine/CommandOutput.h"
 #include "tests/engine/Samples.h"
 #include "tests/engine/TestImporter.h"
+#include "worker/Media.h"
 
 using namespace LibMediaPlayer;
-using discoverer::drawThumbnail;
+using worker::drawThumbnail;
 namespace fs = std::filesystem;
 
 namespace {

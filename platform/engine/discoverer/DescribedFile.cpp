@@ -1,55 +1,38 @@
 // SPDX-License-Identifier: MIT
 #include "discoverer/DescribedFile.h"
 
-#include <algorithm>
-
 #include "LibMediaPlayer/Result.h"
-#include "discoverer/Description.h"
-#include "discoverer/OpenMedia.h"
+#include "worker/Media.h"
 
 namespace discoverer {
 
 using namespace LibMediaPlayer;
-using probe::MediaFile;
 
 namespace {
 
-bool hasPicture(const AVFormatContext& context) {
-    return std::any_of(
-        context.streams, context.streams + context.nb_streams,
-        [](const AVStream* stream) { return probe::isVideo(*stream) || probe::isCover(*stream); });
+FileIdentity identify(const probe::RegularFile& file) {
+    struct stat status {};
+    return ::fstat(file.fd.get(), &status) == 0 ? FileIdentity(status) : FileIdentity();
 }
 
 } // namespace
 
-int DescribedFile::open(const std::string& path) {
-    close();
-    mDetails = mCache.find(FileIdentity(path));
-    if (mDetails)
+int describeFile(const std::string& path, std::shared_ptr<const Details>& pDetails,
+                 DetailsCache& cache) {
+    pDetails = cache.find(FileIdentity(path));
+    if (pDetails)
         return kOk;
-    const int result = openMedia(path, MediaFile::kLook, mpFile);
-    if (mpFile)
-        mIdentity = FileIdentity(mpFile->status());
-    return result;
-}
-
-void DescribedFile::close() {
-    mpFile.reset();
-    mDetails.reset();
-}
-
-std::shared_ptr<const Details> DescribedFile::describe() {
-    if (mpFile)
-        read();
-    return mDetails;
-}
-
-void DescribedFile::read() {
-    mDetails = std::make_shared<Details>(
-        Details{discoverer::describe(*mpFile), hasPicture(mpFile->context())});
-    if (mIdentity.isSettled() && mIdentity == FileIdentity(mpFile->status()))
-        mCache.put(mIdentity, mDetails);
-    mpFile.reset();
+    probe::RegularFile file;
+    if (const int result = file.open(path); result != kOk)
+        return result;
+    const FileIdentity identity = identify(file);
+    Details details;
+    if (const int result = worker::describe(file, path, details); result != kOk)
+        return result;
+    pDetails = std::make_shared<Details>(std::move(details));
+    if (identity.isSettled() && identity == identify(file))
+        cache.put(identity, pDetails);
+    return kOk;
 }
 
 } // namespace discoverer

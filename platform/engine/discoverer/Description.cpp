@@ -176,9 +176,13 @@ private:
 
 } // namespace
 
-MediaMetaInfo describe(probe::MediaFile& file) {
+Details readDetails(probe::MediaFile& file) {
     probe::complete(file);
-    return Describer(file).run();
+    const AVFormatContext& context = file.context();
+    const bool hasPicture = std::any_of(
+        context.streams, context.streams + context.nb_streams,
+        [](const AVStream* stream) { return probe::isVideo(*stream) || probe::isCover(*stream); });
+    return {Describer(file).run(), hasPicture};
 }
 
 } // namespace discoverer

@@ -1,12 +1,12 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include "LibMediaPlayer/IMediaDiscoverer.h"
+#include "discoverer/Details.h"
 #include "probe/MediaFile.h"
 
 namespace discoverer {
 
 /** What a file is. Reads on in the file, and must be the last to do so. */
-LibMediaPlayer::MediaMetaInfo describe(probe::MediaFile& file);
+Details readDetails(probe::MediaFile& file);
 
 } // namespace discoverer

@@ -2,45 +2,27 @@
 #include "discoverer/Discoverer.h"
 
 #include <algorithm>
-#include <chrono>
-#include <utility>
+#include <sys/mman.h>
 
 #include "LibMediaPlayer/Result.h"
-#include "discoverer/Canvas.h"
+#include "base/UniqueFd.h"
+#include "discoverer/DescribedFile.h"
 #include "discoverer/Extensions.h"
-#include "discoverer/FrameFinder.h"
 #include "discoverer/ImageFile.h"
-#include "discoverer/Layout.h"
-#include "discoverer/OpenMedia.h"
 #include "handle/Barrier.h"
 #include "player/Medium.h"
 #include "text/Text.h"
+#include "worker/Media.h"
 
 namespace discoverer {
 
 using namespace LibMediaPlayer;
-using probe::MediaFile;
 
 namespace {
 
-/** Decoding takes longer than looking; still an answer comes within five seconds. */
-constexpr MediaFile::Bounds kImageBounds{256 * 1024 * 1024, std::chrono::milliseconds(3500)};
-
-int drawImage(MediaFile& file, std::chrono::nanoseconds position, Size asked,
-              const std::string& path) {
-    Picture picture;
-    if (const int result = findPicture(file, position, picture); result != kOk)
-        return result;
-    const AVFrame& frame = *picture.frame.get();
-    const Size natural =
-        naturalSize({frame.width, frame.height}, picture.pixelAspect, picture.rotation);
-    const auto layout = layOut(natural, asked.width, asked.height);
-    if (!layout)
-        return kWrongState;
-    Canvas canvas;
-    if (const int result = draw(picture, *layout, canvas); result != kOk)
-        return result;
-    return writeImage(canvas, path);
+/** A file in memory; a worker writes what it draws there. */
+qns::UniqueFd makeSheet() {
+    return qns::UniqueFd(::memfd_create("qnsmedia-image", MFD_CLOEXEC));
 }
 
 } // namespace
@@ -55,7 +37,7 @@ int Discoverer::openMedium(const std::wstring& path) {
     const engine::Medium medium = engine::toMedium(path);
     if (medium.path.empty())
         return medium.uri.empty() ? kNotFound : kNotAvailable;
-    const int result = mFile.open(medium.path);
+    const int result = describeFile(medium.path, mpDetails);
     if (result == kOk)
         mPath = medium.path;
     return result;
@@ -64,16 +46,15 @@ int Discoverer::openMedium(const std::wstring& path) {
 int Discoverer::close() {
     mFailure = kWrongState;
     mPath.clear();
-    mFile.close();
+    mpDetails.reset();
     return kOk;
 }
 
 int Discoverer::metadata(MediaMetaInfo& info) {
     return handle::guarded(static_cast<int>(kInternal), [&] {
-        const auto details = mFile.describe();
-        if (!details)
+        if (!mpDetails)
             return mFailure;
-        info = details->info;
+        info = mpDetails->info;
         return static_cast<int>(kOk);
     });
 }
@@ -85,14 +66,16 @@ int Discoverer::reserved5() {
 int Discoverer::makeImage(int64_t position, int32_t width, int32_t height,
                           const std::wstring& path) {
     return handle::guarded(static_cast<int>(kInternal), [&] {
-        // Before anything is read: such sizes are refused whatever the file.
-        if (mPath.empty() || !layOut({1, 1}, width, height))
+        if (mPath.empty())
             return static_cast<int>(kWrongState);
-        std::unique_ptr<MediaFile> pFile;
-        if (const int result = openMedia(mPath, kImageBounds, pFile); result != kOk)
-            return result;
-        const std::chrono::nanoseconds from(std::max<int64_t>(position, 0));
-        return drawImage(*pFile, from, {width, height}, engine::toBytes(path));
+        const std::string target = engine::toBytes(path);
+        const qns::UniqueFd sheet = makeSheet();
+        if (!sheet)
+            return static_cast<int>(kNotAvailable);
+        const worker::Drawing drawing{std::max<int64_t>(position, 0), width, height,
+                                      formOf(target)};
+        const int result = worker::draw(mPath, drawing, sheet.get());
+        return result == kOk ? writeWhole(target, sheet.get()) : result;
     });
 }
 
@@ -101,10 +84,8 @@ int Discoverer::reserved7() {
 }
 
 int Discoverer::supportedExtensions(SupportedExtensions& extensions) {
-    return handle::guarded(static_cast<int>(kInternal), [&] {
-        extensions = discoverer::supportedExtensions();
-        return static_cast<int>(kOk);
-    });
+    return handle::guarded(static_cast<int>(kInternal),
+                           [&] { return discoverer::findExtensions(extensions); });
 }
 
 } // namespace discoverer

@@ -1,15 +1,16 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <memory>
 #include <string>
 
 #include "LibMediaPlayer/IMediaDiscoverer.h"
 #include "LibMediaPlayer/Result.h"
-#include "discoverer/DescribedFile.h"
+#include "discoverer/Details.h"
 
 namespace discoverer {
 
-/** Reads and draws with the FFmpeg libraries, on the caller's thread. */
+/** Has files read and drawn by worker processes, and waits for them. */
 class Discoverer : public LibMediaPlayer::IMediaDiscoverer {
 public:
     int open(const std::wstring& path) override;
@@ -26,7 +27,7 @@ private:
 
     int mFailure = LibMediaPlayer::kWrongState; ///< why no file is open
     std::string mPath;
-    DescribedFile mFile;
+    std::shared_ptr<const Details> mpDetails; ///< of the file that is open
 };
 
 } // namespace discoverer

@@ -1,11 +1,18 @@
 // SPDX-License-Identifier: MIT
 #include "discoverer/Extensions.h"
 
+#include <mutex>
+#include <optional>
+#include <string>
+
+#include "LibMediaPlayer/Result.h"
 #include "gst/Library.h"
 #include "gst/Types.h"
-#include "probe/AvTypes.h"
+#include "worker/Media.h"
 
 namespace discoverer {
+
+using namespace LibMediaPlayer;
 
 namespace {
 
@@ -78,25 +85,38 @@ bool canPlay(const Factories& decodables, const char* text) {
     return static_cast<bool>(fitting);
 }
 
-LibMediaPlayer::SupportedExtensions findExtensions() {
+/** True when one of the comma separated names is that. */
+bool holds(const std::string& names, const std::string& name) {
+    return ("," + names + ",").find("," + name + ",") != std::string::npos;
+}
+
+SupportedExtensions list(const std::string& demuxers) {
     gst::initialise();
     const Factories decodables(
         handle::kAdopt, gst_element_factory_list_get_elements(GST_ELEMENT_FACTORY_TYPE_DECODABLE,
                                                               GST_RANK_MARGINAL));
-    LibMediaPlayer::SupportedExtensions told;
+    SupportedExtensions told;
     for (const Extension& extension : kExtensions) {
-        if (!av_find_input_format(extension.format) || !canPlay(decodables, extension.caps))
-            continue;
-        told.extensions += (told.count++ == 0 ? L"" : L",") + std::wstring(extension.name);
+        if (holds(demuxers, extension.format) && canPlay(decodables, extension.caps))
+            told.extensions += (told.count++ == 0 ? L"" : L",") + std::wstring(extension.name);
     }
     return told;
 }
 
 } // namespace
 
-LibMediaPlayer::SupportedExtensions supportedExtensions() {
-    static const LibMediaPlayer::SupportedExtensions found = findExtensions();
-    return found;
+int findExtensions(SupportedExtensions& extensions) {
+    static std::mutex mutex;
+    static std::optional<SupportedExtensions> known;
+    const std::lock_guard lock(mutex);
+    std::string demuxers;
+    if (!known) {
+        if (const int result = worker::findDemuxers(demuxers); result != kOk)
+            return result;
+        known = list(demuxers);
+    }
+    extensions = *known;
+    return kOk;
 }
 
 } // namespace discoverer

@@ -5,7 +5,10 @@
 
 namespace discoverer {
 
-/** Those of files that the installed libraries can both describe and play. */
-LibMediaPlayer::SupportedExtensions supportedExtensions();
+/**
+ * Those of files that the installed libraries can both describe and play. Returns 0 or a
+ * LibMediaPlayer::Result. Any thread.
+ */
+int findExtensions(LibMediaPlayer::SupportedExtensions& extensions);
 
 } // namespace discoverer

@@ -7,18 +7,20 @@
 #include <cstdio>
 #include <fcntl.h>
 #include <string_view>
+#include <sys/sendfile.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
 #include "LibMediaPlayer/Result.h"
 #include "base/UniqueFd.h"
-#include "discoverer/ImageEncoder.h"
 
 namespace discoverer {
 
 using namespace LibMediaPlayer;
 
 namespace {
+
+constexpr std::size_t kLargestStep = 64 * 1024 * 1024;
 
 bool endsWith(const std::string& path, std::string_view ending) {
     const auto isSame = [](char one, char other) {
@@ -64,18 +66,14 @@ public:
     WholeFile(const WholeFile&) = delete;
     WholeFile& operator=(const WholeFile&) = delete;
 
-    void write(const void* data, std::size_t size) {
-        const auto* bytes = static_cast<const char*>(data);
-        while (mResult == kOk && size > 0) {
-            const ssize_t count = ::write(mFile.get(), bytes, size);
-            if (count < 0 && errno == EINTR)
-                continue;
-            if (count < 0) {
+    /** All that `content` holds. */
+    void fill(int content) {
+        off_t place = 0;
+        ssize_t count = 1;
+        while (mResult == kOk && count > 0) {
+            count = ::sendfile(mFile.get(), content, &place, kLargestStep);
+            if (count < 0 && errno != EINTR)
                 mResult = resultOfErrno(errno);
-                return;
-            }
-            size -= static_cast<std::size_t>(count);
-            bytes += count;
         }
     }
 
@@ -105,29 +103,21 @@ bool isTaken(const std::string& path) {
     return ::stat(path.c_str(), &status) == 0 && !S_ISREG(status.st_mode);
 }
 
-int writeWhole(const std::string& path, const void* data, std::size_t size) {
+} // namespace
+
+ImageForm formOf(const std::string& path) {
+    if (endsWith(path, ".png"))
+        return ImageForm::kPng;
+    return endsWith(path, ".jpg") || endsWith(path, ".jpeg") ? ImageForm::kJpeg
+                                                             : ImageForm::kPixels;
+}
+
+int writeWhole(const std::string& path, int content) {
     if (isTaken(path))
         return kAccessDenied;
     WholeFile file(path);
-    file.write(data, size);
+    file.fill(content);
     return file.finish();
-}
-
-int writeEncoded(const Canvas& canvas, const Encoding& encoding, const std::string& path) {
-    const probe::Packet packet = encode(canvas, encoding);
-    if (!packet)
-        return kInternal;
-    return writeWhole(path, packet->data, static_cast<std::size_t>(packet->size));
-}
-
-} // namespace
-
-int writeImage(const Canvas& canvas, const std::string& path) {
-    if (endsWith(path, ".png"))
-        return writeEncoded(canvas, kPng, path);
-    if (endsWith(path, ".jpg") || endsWith(path, ".jpeg"))
-        return writeEncoded(canvas, kJpeg, path);
-    return writeWhole(path, canvas.pixels.data(), canvas.pixels.size() * sizeof(std::uint32_t));
 }
 
 } // namespace discoverer

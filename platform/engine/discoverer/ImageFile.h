@@ -3,14 +3,17 @@
 
 #include <string>
 
-#include "discoverer/Canvas.h"
+#include "discoverer/ImageForm.h"
 
 namespace discoverer {
 
+/** By the name's ending; bare pixels when it says nothing. */
+ImageForm formOf(const std::string& path);
+
 /**
- * Writes PNG or JPEG by the name's ending, otherwise the bare pixels; whole or not at all, in the
- * place of what was there. Returns 0 or a LibMediaPlayer::Result.
+ * Writes what the descriptor `content` holds; whole or not at all, in the place of what was there.
+ * Returns 0 or a LibMediaPlayer::Result.
  */
-int writeImage(const Canvas& canvas, const std::string& path);
+int writeWhole(const std::string& path, int content);
 
 } // namespace discoverer

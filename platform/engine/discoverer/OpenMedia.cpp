@@ -24,9 +24,9 @@ bool canDecode(const AVFormatContext& context) {
 
 } // namespace
 
-int openMedia(const std::string& path, MediaFile::Bounds bounds,
+int openMedia(probe::RegularFile file, MediaFile::Bounds bounds,
               std::unique_ptr<MediaFile>& pFile) {
-    auto opened = MediaFile::open(path, bounds);
+    auto opened = MediaFile::open(std::move(file), bounds);
     if (const auto* const failure = std::get_if<probe::LookFailure>(&opened))
         return failure->result;
     if (std::holds_alternative<probe::LookUndecided>(opened))

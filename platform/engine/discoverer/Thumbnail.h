@@ -14,10 +14,4 @@ struct Thumbnail {
 /** Neither side of a thumbnail is longer. Smaller pictures keep their size. */
 inline constexpr int kThumbnailSide = 256;
 
-/**
- * Draws the file's cover or, without one, an early picture of the film that is not dark. Ends in
- * five seconds, whatever the file.
- */
-Thumbnail drawThumbnail(const std::string& path);
-
 } // namespace discoverer

@@ -7,11 +7,10 @@
 namespace importer {
 
 Probed probeByLook(const std::string& path) {
-    discoverer::DescribedFile file;
-    if (const int result = file.open(path); result != LibMediaPlayer::kOk)
+    std::shared_ptr<const discoverer::Details> pDetails;
+    if (const int result = discoverer::describeFile(path, pDetails); result != LibMediaPlayer::kOk)
         return {result, {}, false};
-    const auto details = file.describe();
-    return {LibMediaPlayer::kOk, details->info, details->hasPicture};
+    return {LibMediaPlayer::kOk, pDetails->info, pDetails->hasPicture};
 }
 
 } // namespace importer

@@ -6,6 +6,7 @@
 #include "gst/Library.h"
 #include "handle/Barrier.h"
 #include "player/Session.h"
+#include "worker/Pool.h"
 
 namespace engine {
 
@@ -45,6 +46,7 @@ std::deque<Item> Engine::abandon() {
 
 void Engine::run() {
     gst::initialise();
+    worker::Pool::shared().warm();
     while (!mQuit) {
         const TimePoint deadline = mpSession ? mpSession->deadline() : kNever;
         handle::guarded([&] {

@@ -12,6 +12,7 @@
 #include "player/FixedChain.h"
 #include "player/FrameGate.h"
 #include "player/PlaybinChain.h"
+#include "worker/Media.h"
 
 namespace engine {
 
@@ -96,7 +97,7 @@ void Session::open() {
 bool Session::look() {
     if (mMedium.path.empty() && !mMedium.uri.empty())
         return true;
-    probe::LookResult result = probe::lookAt(mMedium.path);
+    probe::LookResult result = worker::lookAt(mMedium.path);
     if (const auto* const refused = std::get_if<probe::LookFailure>(&result)) {
         fail(failure(refused->result));
         return false;

@@ -15,10 +15,9 @@ constexpr int kBufferSize = 32 * 1024;
 
 } // namespace
 
-FileInput::FileInput(qns::UniqueFd file, std::int64_t size, std::int64_t byteBudget,
+FileInput::FileInput(RegularFile file, std::int64_t byteBudget,
                      std::chrono::milliseconds timeBudget)
     : mFile(std::move(file)),
-      mSize(size),
       mDeadline(std::chrono::steady_clock::now() + timeBudget),
       mBytesLeft(byteBudget),
       mContext(kAdopt, avio_alloc_context(static_cast<unsigned char*>(av_malloc(kBufferSize)),
@@ -26,13 +25,6 @@ FileInput::FileInput(qns::UniqueFd file, std::int64_t size, std::int64_t byteBud
 
 bool FileInput::isExhausted() const {
     return mBytesLeft <= 0 || std::chrono::steady_clock::now() >= mDeadline;
-}
-
-struct stat FileInput::status() const {
-    struct stat status {};
-    if (::fstat(mFile.get(), &status) != 0)
-        status = {};
-    return status;
 }
 
 int FileInput::readBytes(void* input, std::uint8_t* buffer, int size) {
@@ -46,8 +38,8 @@ std::int64_t FileInput::seekTo(void* input, std::int64_t offset, int whence) {
 int FileInput::read(std::uint8_t* buffer, int size) {
     if (isExhausted())
         return AVERROR_EXIT;
-    const ssize_t count =
-        ::pread(mFile.get(), buffer, static_cast<std::size_t>(size), static_cast<off_t>(mOffset));
+    const ssize_t count = ::pread(mFile.fd.get(), buffer, static_cast<std::size_t>(size),
+                                  static_cast<off_t>(mOffset));
     if (count < 0)
         return AVERROR(errno);
     if (count == 0)
@@ -60,7 +52,7 @@ int FileInput::read(std::uint8_t* buffer, int size) {
 std::size_t FileInput::readAt(std::int64_t place, char* buffer, std::size_t size) {
     if (isExhausted())
         return 0;
-    const ssize_t count = ::pread(mFile.get(), buffer, size, static_cast<off_t>(place));
+    const ssize_t count = ::pread(mFile.fd.get(), buffer, size, static_cast<off_t>(place));
     mBytesLeft -= std::max<ssize_t>(count, 0);
     return static_cast<std::size_t>(std::max<ssize_t>(count, 0));
 }
@@ -68,13 +60,13 @@ std::size_t FileInput::readAt(std::int64_t place, char* buffer, std::size_t size
 std::int64_t FileInput::seek(std::int64_t offset, int whence) {
     switch (whence & ~AVSEEK_FORCE) {
     case AVSEEK_SIZE:
-        return mSize;
+        return mFile.size;
     case SEEK_SET:
         return mOffset = offset;
     case SEEK_CUR:
         return mOffset += offset;
     case SEEK_END:
-        return mOffset = mSize + offset;
+        return mOffset = mFile.size + offset;
     default:
         return AVERROR(EINVAL);
     }

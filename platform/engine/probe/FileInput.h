@@ -3,11 +3,9 @@
 
 #include <chrono>
 #include <cstdint>
-#include <string>
-#include <sys/stat.h>
 
-#include "base/UniqueFd.h"
 #include "probe/AvTypes.h"
+#include "probe/RegularFile.h"
 
 namespace probe {
 
@@ -17,14 +15,12 @@ namespace probe {
  */
 class FileInput {
 public:
-    FileInput(qns::UniqueFd file, std::int64_t size, std::int64_t byteBudget,
-              std::chrono::milliseconds timeBudget);
+    FileInput(RegularFile file, std::int64_t byteBudget, std::chrono::milliseconds timeBudget);
     FileInput(const FileInput&) = delete;
     FileInput& operator=(const FileInput&) = delete;
 
     [[nodiscard]] AVIOContext* context() const { return mContext.get(); }
-    [[nodiscard]] std::int64_t size() const { return mSize; } ///< bytes
-    [[nodiscard]] struct stat status() const;                 ///< all zero when it fails
+    [[nodiscard]] std::int64_t size() const { return mFile.size; } ///< bytes
     [[nodiscard]] bool isExhausted() const;
 
     /** Reads beside the context, which stays where it is; returns how many bytes, less at the end.
@@ -38,8 +34,7 @@ private:
     int read(std::uint8_t* buffer, int size);
     std::int64_t seek(std::int64_t offset, int whence);
 
-    const qns::UniqueFd mFile;
-    const std::int64_t mSize;
+    const RegularFile mFile;
     const std::chrono::steady_clock::time_point mDeadline;
     std::int64_t mBytesLeft;
     std::int64_t mOffset = 0;

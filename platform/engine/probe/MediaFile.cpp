@@ -3,13 +3,9 @@
 
 #include <algorithm>
 #include <array>
-#include <cerrno>
-#include <fcntl.h>
-#include <sys/stat.h>
 #include <utility>
 
 #include "LibMediaPlayer/Result.h"
-#include "base/UniqueFd.h"
 #include "probe/Duration.h"
 #include "probe/Formats.h"
 #include "probe/Fragments.h"
@@ -24,41 +20,6 @@ namespace {
 
 /** Below it a few bytes agree by chance. */
 constexpr int kLeastScore = AVPROBE_SCORE_RETRY / 2;
-
-int resultOfErrno(int error) {
-    switch (error) {
-    case EACCES:
-    case EPERM:
-        return kAccessDenied;
-    case ENOENT:
-    case ENOTDIR:
-    case ENAMETOOLONG:
-    case ELOOP:
-        return kNotFound;
-    default:
-        return kNotAvailable;
-    }
-}
-
-struct OpenedFile {
-    qns::UniqueFd file;
-    std::int64_t size = 0;
-};
-
-/** A pipe or a device could block, or be set going, by opening it alone. */
-std::variant<OpenedFile, LookFailure> openRegularFile(const std::string& path) {
-    struct stat status {};
-    if (::stat(path.c_str(), &status) != 0)
-        return LookFailure{resultOfErrno(errno)};
-    if (!S_ISREG(status.st_mode))
-        return LookFailure{kNotMedia};
-    qns::UniqueFd file(::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK | O_NOCTTY));
-    if (!file)
-        return LookFailure{resultOfErrno(errno)};
-    if (::fstat(file.get(), &status) != 0 || !S_ISREG(status.st_mode) || status.st_size == 0)
-        return LookFailure{kNotMedia};
-    return OpenedFile{std::move(file), status.st_size};
-}
 
 bool isPlayable(const AVStream& stream) {
     return isVideo(stream) || isAudio(stream);
@@ -143,16 +104,12 @@ bool isCutOff(AVIOContext& input) {
 
 } // namespace
 
-MediaFile::MediaFile(qns::UniqueFd file, std::int64_t size, Bounds bounds)
-    : mInput(std::move(file), size, bounds.bytes, bounds.time) {}
+MediaFile::MediaFile(RegularFile file, Bounds bounds)
+    : mInput(std::move(file), bounds.bytes, bounds.time) {}
 
-MediaFile::Opened MediaFile::open(const std::string& path, Bounds bounds) {
+MediaFile::Opened MediaFile::open(RegularFile file, Bounds bounds) {
     av_log_set_level(AV_LOG_QUIET);
-    auto opened = openRegularFile(path);
-    if (const auto* const failure = std::get_if<LookFailure>(&opened))
-        return *failure;
-    auto& file = std::get<OpenedFile>(opened);
-    std::unique_ptr<MediaFile> pMedia(new MediaFile(std::move(file.file), file.size, bounds));
+    std::unique_ptr<MediaFile> pMedia(new MediaFile(std::move(file), bounds));
     if (const int result = pMedia->readHeader(); result != kOk)
         return pMedia->failed(result);
     return pMedia;
@@ -241,7 +198,7 @@ bool MediaFile::isEstimate() {
            (mAnalysed && mContext->duration_estimation_method == AVFMT_DURATION_FROM_BITRATE);
 }
 
-const MediaFile::Duration& MediaFile::duration() {
+const Duration& MediaFile::duration() {
     if (std::exchange(mDurationKnown, true) || isPicture())
         return mDuration;
     mDuration.time = std::chrono::microseconds(std::max<std::int64_t>(mContext->duration, 0));

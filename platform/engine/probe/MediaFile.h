@@ -3,22 +3,15 @@
 
 #include <chrono>
 #include <memory>
-#include <string>
 #include <string_view>
 #include <variant>
 
 #include "probe/AvTypes.h"
 #include "probe/FileInput.h"
+#include "probe/LookOutcome.h"
+#include "probe/RegularFile.h"
 
 namespace probe {
-
-/** Why a file cannot be played: a LibMediaPlayer::Result. */
-struct LookFailure {
-    int result = 0;
-};
-
-/** The look had to end before it knew; the file may be good all the same. */
-struct LookUndecided {};
 
 /**
  * A media file whose header has been read. Reading is bounded in bytes and time from opening on,
@@ -35,8 +28,8 @@ public:
     };
     static constexpr Bounds kLook{64 * 1024 * 1024, std::chrono::milliseconds(1500)};
 
-    /** Anything but a regular file is refused unopened, as is what holds no media. */
-    static Opened open(const std::string& path, Bounds bounds = kLook);
+    /** Refuses what holds no media. */
+    static Opened open(RegularFile file, Bounds bounds = kLook);
 
     MediaFile(const MediaFile&) = delete;
     MediaFile& operator=(const MediaFile&) = delete;
@@ -47,9 +40,6 @@ public:
     [[nodiscard]] std::string_view formatName() const { return mpFormat->name; }
 
     [[nodiscard]] std::int64_t size() const { return mInput.size(); } ///< bytes
-
-    /** As the file system has it now. */
-    [[nodiscard]] struct stat status() const { return mInput.status(); }
 
     /** One picture, without time. */
     [[nodiscard]] bool isPicture() const;
@@ -69,14 +59,10 @@ public:
      * How long it plays, 0 when unknown. Where header and index do not say, all packets are
      * read, as far as the bounds go, so ask after everything else that is to be read.
      */
-    struct Duration {
-        std::chrono::nanoseconds time{};
-        bool isMeasured = false; ///< from the packets' own times; exact
-    };
     [[nodiscard]] const Duration& duration();
 
 private:
-    MediaFile(qns::UniqueFd file, std::int64_t size, Bounds bounds);
+    MediaFile(RegularFile file, Bounds bounds);
     Opened failed(int result) const;
     [[nodiscard]] int readHeader();
     bool findFormat();

@@ -1,6 +1,10 @@
 // SPDX-License-Identifier: MIT
 #include "probe/MediaLook.h"
 
+#include <utility>
+
+#include "probe/MediaFile.h"
+
 namespace probe {
 
 namespace {
@@ -38,8 +42,8 @@ MediaLook describe(MediaFile& file) {
 
 } // namespace
 
-LookResult lookAt(const std::string& path) {
-    auto opened = MediaFile::open(path);
+LookResult lookAt(RegularFile file) {
+    auto opened = MediaFile::open(std::move(file));
     if (const auto* const failure = std::get_if<LookFailure>(&opened))
         return *failure;
     if (std::holds_alternative<LookUndecided>(opened))

@@ -5,7 +5,8 @@
 #include <string>
 #include <variant>
 
-#include "probe/MediaFile.h"
+#include "probe/LookOutcome.h"
+#include "probe/RegularFile.h"
 
 namespace probe {
 
@@ -24,7 +25,7 @@ struct MediaLook {
     std::string container; ///< libavformat's name, such as "mov,mp4,m4a,3gp,3g2,mj2"
     bool still = false;    ///< one picture, without time
     bool tagged = false;   ///< the stream begins with an ID3v2 tag
-    MediaFile::Duration duration;
+    Duration duration;
     int videoCount = 0; ///< without cover pictures
     int audioCount = 0;
     int textCount = 0;
@@ -36,8 +37,8 @@ using LookResult = std::variant<MediaLook, LookFailure, LookUndecided>;
 
 /**
  * Looks at a file without decoding: in well under a millisecond as a rule, and in a bounded time
- * whatever the file. Anything but a regular file is refused unopened. Any thread.
+ * whatever the file. Any thread.
  */
-LookResult lookAt(const std::string& path);
+LookResult lookAt(RegularFile file);
 
 } // namespace probe

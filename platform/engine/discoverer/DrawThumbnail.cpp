@@ -1,10 +1,11 @@
 // SPDX-License-Identifier: MIT
-#include "discoverer/Thumbnail.h"
+#include "discoverer/DrawThumbnail.h"
 
 #include <algorithm>
 #include <array>
 #include <chrono>
 #include <memory>
+#include <utility>
 
 #include "LibMediaPlayer/Result.h"
 #include "discoverer/Canvas.h"
@@ -103,10 +104,10 @@ int drawBrightScene(MediaFile& file, Canvas& brightest) {
 
 } // namespace
 
-Thumbnail drawThumbnail(const std::string& path) {
+Thumbnail drawThumbnail(probe::RegularFile file) {
     Thumbnail thumbnail;
     std::unique_ptr<MediaFile> pFile;
-    thumbnail.result = openMedia(path, kBounds, pFile);
+    thumbnail.result = openMedia(std::move(file), kBounds, pFile);
     if (!pFile)
         return thumbnail;
     Canvas canvas;

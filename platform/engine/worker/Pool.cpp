@@ -1,0 +1,108 @@
+// SPDX-License-Identifier: MIT
+#include "worker/Pool.h"
+
+#include <cerrno>
+#include <dlfcn.h>
+#include <syslog.h>
+#include <system_error>
+#include <unistd.h>
+#include <utility>
+
+#include "LibMediaPlayer/Result.h"
+#include "qnsys.h"
+#include "worker/Message.h"
+
+namespace worker {
+
+using namespace LibMediaPlayer;
+
+namespace {
+
+constexpr std::size_t kMostIdle = 2;
+
+/** The folder of the library, or program, that this code is in. */
+std::string ownFolder() {
+    static const char mark = 0;
+    Dl_info info{};
+    const std::string path = ::dladdr(&mark, &info) && info.dli_fname ? info.dli_fname : "";
+    return path.substr(0, path.rfind('/') + 1);
+}
+
+} // namespace
+
+std::string defaultProgram() {
+    const std::string beside = ownFolder() + "qnsmedia/media-worker";
+    // Programs that have the engine built in lie beside the folder of libraries.
+    return ::access(beside.c_str(), X_OK) == 0 ? beside
+                                               : ownFolder() + "../lib/qnsmedia/media-worker";
+}
+
+Pool& Pool::shared() {
+    // Never destroyed: threads that are left behind may still ask. The workers end with this
+    // process.
+    static Pool& pool = *new Pool;
+    return pool;
+}
+
+void Pool::warm() {
+    giveBack(take());
+}
+
+std::variant<std::string, int> Pool::ask(const Question& question) {
+    auto process = take();
+    if (!process)
+        return kNotAvailable;
+    MessageWriter message;
+    Request request = question.request;
+    message(request);
+    Process::Answer answer = process->ask(message.bytes(), question.files, question.patience);
+    if (answer.outcome != Process::Outcome::kAnswered)
+        return lose(std::move(process), answer.outcome, question.name);
+    giveBack(std::move(process));
+    return std::move(answer.bytes);
+}
+
+std::unique_ptr<Process> Pool::take() {
+    while (auto process = takeIdle()) {
+        if (process->isIdle())
+            return process;
+    }
+    return start();
+}
+
+std::unique_ptr<Process> Pool::takeIdle() {
+    const std::lock_guard lock(mMutex);
+    if (mIdle.empty())
+        return nullptr;
+    auto process = std::move(mIdle.back());
+    mIdle.pop_back();
+    return process;
+}
+
+std::unique_ptr<Process> Pool::start() const {
+    auto process = Process::start(mProgram);
+    if (!process)
+        qnsys_syslog(LOG_ERR, "Media worker cannot be started: %s: %s", mProgram.c_str(),
+                     std::generic_category().message(errno).c_str());
+    return process;
+}
+
+void Pool::giveBack(std::unique_ptr<Process> process) {
+    const std::lock_guard lock(mMutex);
+    if (process && mIdle.size() < kMostIdle)
+        mIdle.push_back(std::move(process));
+}
+
+int Pool::lose(std::unique_ptr<Process> process, Process::Outcome outcome,
+               const std::string& name) {
+    const bool isLate = outcome == Process::Outcome::kTimedOut;
+    const std::string end = isLate ? "took too long" : process->end();
+    qnsys_syslog(LOG_WARNING, "Media worker %s, reading %s", end.c_str(), name.c_str());
+    process.reset();
+    if (outcome == Process::Outcome::kNotStarted)
+        return kNotAvailable;
+    giveBack(start());
+    return isLate ? kTimedOut : kDamaged;
+}
+
+} // namespace worker

@@ -1,0 +1,56 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <memory>
+#include <mutex>
+#include <string>
+#include <utility>
+#include <variant>
+#include <vector>
+
+#include "worker/Process.h"
+#include "worker/Request.h"
+
+namespace worker {
+
+/** The program of this engine's workers: beside the library, in its folder qnsmedia/. */
+std::string defaultProgram();
+
+/**
+ * Worker processes, so that a file that crashes, hangs or swells what reads it costs the question
+ * about that file and nothing else. As many run as are asked at once; two of them stay. Workers
+ * inherit the scheduling of the thread whose question made them start. Any thread.
+ */
+class Pool {
+public:
+    explicit Pool(std::string program = defaultProgram()) : mProgram(std::move(program)) {}
+
+    /** The one that serves who asks for somebody who waits. */
+    static Pool& shared();
+
+    /** Starts a worker, if there is none, so that the first question need not wait for it. */
+    void warm();
+
+    struct Question {
+        Request request;
+        std::vector<int> files; ///< what the request is about
+        Process::Patience patience;
+        std::string name; ///< of the file, for the log
+    };
+
+    /** The answer's bytes, or a LibMediaPlayer::Result when there is none. Ends in time. */
+    std::variant<std::string, int> ask(const Question& question);
+
+private:
+    std::unique_ptr<Process> take();
+    std::unique_ptr<Process> takeIdle();
+    std::unique_ptr<Process> start() const;
+    void giveBack(std::unique_ptr<Process> process);
+    int lose(std::unique_ptr<Process> process, Process::Outcome outcome, const std::string& name);
+
+    const std::string mProgram;
+    std::mutex mMutex; ///< guards what follows
+    std::vector<std::unique_ptr<Process>> mIdle;
+};
+
+} // namespace worker
