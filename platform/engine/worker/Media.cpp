@@ -28,7 +28,12 @@ struct Nothing {};
 template<typename Message>
 void fields(Message& /*message*/, Nothing& /*nothing*/) {}
 
-/** A worker that a file has taken over can answer anything. */
+// A worker that a file has taken over can answer anything.
+
+bool isResult(int result) {
+    return result >= kWrongState && result <= kInternal;
+}
+
 template<typename Reply>
 bool isPossible(const Reply& /*reply*/) {
     return true;
@@ -50,7 +55,8 @@ int ask(Pool& pool, const Pool::Question& question, Reply& reply) {
     message(result);
     if (result == kOk)
         message(reply);
-    return message.isGood() && isPossible(reply) ? result : static_cast<int>(kInternal);
+    return message.isGood() && isResult(result) && isPossible(reply) ? result
+                                                                     : static_cast<int>(kInternal);
 }
 
 } // namespace

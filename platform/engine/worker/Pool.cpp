@@ -2,6 +2,7 @@
 #include "worker/Pool.h"
 
 #include <cerrno>
+#include <cstdlib>
 #include <dlfcn.h>
 #include <syslog.h>
 #include <system_error>
@@ -31,6 +32,8 @@ std::string ownFolder() {
 } // namespace
 
 std::string defaultProgram() {
+    if (const char* const chosen = ::secure_getenv("QNS_MEDIA_WORKER"))
+        return chosen;
     const std::string beside = ownFolder() + "qnsmedia/media-worker";
     // Programs that have the engine built in lie beside the folder of libraries.
     return ::access(beside.c_str(), X_OK) == 0 ? beside

@@ -13,7 +13,8 @@
 
 namespace worker {
 
-/** The program of this engine's workers: beside the library, in its folder qnsmedia/. */
+/** The workers' program: what QNS_MEDIA_WORKER names, else qnsmedia/media-worker beside the
+ * library. */
 std::string defaultProgram();
 
 /**
