@@ -29,11 +29,12 @@ IMediaImporter* InterfaceFactory::createImporter() {
         importer::Options options;
         options.dataFolder = importer::dataFolder();
         options.probe = importer::probeByLook;
-        // Workers of its own: they run when nothing else does, as the thread that asks them.
-        options.drawThumbnail = [pPool =
-                                     std::make_shared<worker::Pool>()](const std::string& path) {
-            return worker::drawThumbnail(path, *pPool);
+        const auto pWorkers =
+            std::make_shared<worker::Pool>(worker::defaultProgram(), worker::Haste::kWhenIdle);
+        options.drawThumbnail = [pWorkers](const std::string& path) {
+            return worker::drawThumbnail(path, *pWorkers);
         };
+        options.stopDrawing = [pWorkers] { pWorkers->cancel(); };
         return std::make_unique<importer::Importer>(std::move(options)).release();
     });
 }

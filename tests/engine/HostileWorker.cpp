@@ -3,8 +3,8 @@
 // a decoder would have it do.
 #include <array>
 #include <cerrno>
-#include <csignal>
 #include <clocale>
+#include <csignal>
 #include <fcntl.h>
 #include <memory>
 #include <string>
@@ -16,6 +16,7 @@
 #include "LibMediaPlayer/Result.h"
 #include "discoverer/Details.h"
 #include "worker/Answers.h"
+#include "worker/Idleness.h"
 #include "worker/Message.h"
 #include "worker/Sandbox.h"
 
@@ -116,7 +117,9 @@ std::string answer(worker::Request& request, Files files) {
 
 } // namespace
 
-int main() {
+int main(int argc, char** argv) {
+    if (argc > 1 && std::string_view(argv[1]) == worker::kIdleOption)
+        worker::runWhenIdle();
     std::setlocale(LC_ALL, "");
     worker::enterSandbox();
     worker::serve(worker::kServerSocket, answer);

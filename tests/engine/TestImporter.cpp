@@ -87,7 +87,6 @@ TestImporter::TestImporter(const fs::path& data, importer::Probe probe, Handler 
     options.dataFolder = data.string();
     options.probe = std::move(probe);
     options.drawThumbnail = std::move(drawThumbnail);
-    options.drawingHaste = importer::Haste::kNormal;
     options.progressInterval = std::chrono::milliseconds(0);
     mpImporter = std::make_unique<importer::Importer>(std::move(options));
     mpImporter->setNotify([this, onNotify = std::move(onNotify)](Notification& notification) {

@@ -7,7 +7,8 @@
 #include <csignal>
 #include <filesystem>
 #include <fstream>
-#include <poll.h>
+#include <sched.h>
+#include <sys/wait.h>
 #include <thread>
 
 #include "LibMediaPlayer/Result.h"
@@ -30,25 +31,25 @@ protected:
         return mFolder.path(order);
     }
 
-    int describe(const std::string& path, Details& details) {
+    static int describe(const std::string& path, Details& details, Pool& pool) {
         probe::RegularFile file;
         const int result = file.open(path);
-        return result == kOk ? worker::describe(file, path, details, mPool) : result;
+        return result == kOk ? worker::describe(file, path, details, pool) : result;
     }
 
     int describe(const std::string& path) {
         Details details;
-        return describe(path, details);
+        return describe(path, details, mPool);
     }
 
     /** What a worker that a file has taken over says. */
-    std::string told(const std::string& order) {
+    std::string told(const std::string& order, Pool& pool) {
         Details details;
-        EXPECT_EQ(describe(hostile(order), details), kOk) << order;
+        EXPECT_EQ(describe(hostile(order), details, pool), kOk) << order;
         return details.info.system.mediaType;
     }
 
-    pid_t idleWorker() { return std::stoi(told("count")); }
+    pid_t idleWorker(Pool& pool) { return std::stoi(told("count", pool)); }
 
     TestFolder mFolder;
     Pool mPool{QNS_HOSTILE_WORKER};
@@ -67,7 +68,7 @@ bool isGone(pid_t process) {
 
 TEST_F(Worker, ReadsWhatItIsGiven) {
     Details details;
-    ASSERT_EQ(describe(samplePath("film.mp4"), details), kOk);
+    ASSERT_EQ(describe(samplePath("film.mp4"), details, mPool), kOk);
     EXPECT_EQ(details.info.video.width, 192);
     EXPECT_TRUE(details.hasPicture);
     EXPECT_EQ(describe(samplePath("text.txt")), kNotMedia);
@@ -108,7 +109,7 @@ TEST_F(Worker, AFileThatWantsAllMemoryGetsABoundedPartOfIt) {
 }
 
 TEST_F(Worker, AFileThatHasTakenItOverReachesNothing) {
-    EXPECT_EQ(told("break out"), "possible: ");
+    EXPECT_EQ(told("break out", mPool), "possible: ");
 }
 
 #endif
@@ -121,7 +122,7 @@ TEST_F(Worker, WhatItSaysIsNotBelievedWhenItCannotBe) {
 
 TEST_F(Worker, OneThatWasKilledWhileItWaitedIsReplacedUnnoticed) {
     for (int turn = 0; turn < 10; ++turn) {
-        const pid_t worker = idleWorker();
+        const pid_t worker = idleWorker(mPool);
         // Its end is seen by its parent, which is this process: it does not vanish before.
         ::kill(worker, SIGKILL);
         siginfo_t info{};
@@ -132,13 +133,13 @@ TEST_F(Worker, OneThatWasKilledWhileItWaitedIsReplacedUnnoticed) {
 }
 
 TEST_F(Worker, KeepsNothingOfTheFilesItHasRead) {
-    const pid_t worker = idleWorker();
+    const pid_t worker = idleWorker(mPool);
     const std::size_t before = descriptorCount(worker);
     for (int turn = 0; turn < 100; ++turn) {
         EXPECT_EQ(describe(samplePath("film.mp4")), kOk);
         EXPECT_EQ(describe(samplePath("text.txt")), kNotMedia);
     }
-    EXPECT_EQ(idleWorker(), worker);
+    EXPECT_EQ(idleWorker(mPool), worker);
     EXPECT_EQ(descriptorCount(worker), before);
 }
 
@@ -146,23 +147,32 @@ TEST_F(Worker, EndsWithWhoHasIt) {
     pid_t worker = 0;
     {
         Pool pool(QNS_HOSTILE_WORKER);
-        probe::RegularFile file;
-        Details details;
-        ASSERT_EQ(file.open(hostile("count")), kOk);
-        ASSERT_EQ(worker::describe(file, "", details, pool), kOk);
-        worker = std::stoi(details.info.system.mediaType);
+        worker = idleWorker(pool);
         EXPECT_FALSE(isGone(worker));
     }
     EXPECT_TRUE(isGone(worker));
 }
 
+TEST_F(Worker, IsLeftAloneWhenItsAnswerIsNoLongerWanted) {
+    std::thread asking([this] { EXPECT_EQ(describe(hostile("hang")), kCancelled); });
+    const auto begin = std::chrono::steady_clock::now();
+    mPool.cancel();
+    asking.join();
+    EXPECT_LT(std::chrono::steady_clock::now() - begin, 2s) << "before it is too late";
+    EXPECT_EQ(describe(samplePath("film.mp4")), kCancelled);
+}
+
+TEST_F(Worker, RunsOnlyWhenTheMachineIsIdleIfThatIsWanted) {
+    Pool pool(QNS_HOSTILE_WORKER, worker::Haste::kWhenIdle);
+    EXPECT_EQ(::sched_getscheduler(idleWorker(pool)), SCHED_IDLE);
+    EXPECT_EQ(::sched_getscheduler(idleWorker(mPool)), SCHED_OTHER);
+}
+
 TEST_F(Worker, ThatCannotBeStartedIsNotAvailable) {
     for (const char* const program : {"/nowhere/media-worker", "/bin/false"}) {
         Pool pool(program);
-        probe::RegularFile file;
         Details details;
-        ASSERT_EQ(file.open(samplePath("film.mp4")), kOk);
-        EXPECT_EQ(worker::describe(file, "", details, pool), kNotAvailable) << program;
+        EXPECT_EQ(describe(samplePath("film.mp4"), details, pool), kNotAvailable) << program;
     }
 }
 

@@ -2,6 +2,7 @@
 #pragma once
 
 #include <chrono>
+#include <functional>
 #include <string>
 
 #include "importer/Probe.h"
@@ -13,8 +14,8 @@ namespace importer {
 struct Options {
     std::string dataFolder; ///< absolute; empty when it is not known
     Probe probe;
-    DrawThumbnail drawThumbnail; ///< empty: nobody wants any
-    Haste drawingHaste = Haste::kWhenIdle;
+    DrawThumbnail drawThumbnail;       ///< empty: nobody wants any
+    std::function<void()> stopDrawing; ///< makes those return soon that are being drawn
     std::chrono::milliseconds progressInterval{200}; ///< at least so long between two
     std::chrono::microseconds notifyGap{300};        ///< at least so long between any two
 };

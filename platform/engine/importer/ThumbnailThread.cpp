@@ -1,10 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include "importer/ThumbnailThread.h"
 
-#include <pthread.h>
-#include <sched.h>
-#include <sys/syscall.h>
-#include <unistd.h>
 #include <utility>
 
 #include "LibMediaPlayer/Result.h"
@@ -12,28 +8,8 @@
 
 namespace importer {
 
-namespace {
-
-void setPolicy(pthread_t thread, int policy) {
-    const sched_param parameters{};
-    ::pthread_setschedparam(thread, policy, &parameters);
-}
-
-/** Of the calling thread; the C library has no function for it. */
-void readOnlyWhenDiskIsIdle() {
-    constexpr int kOneThread = 1;
-    constexpr int kCallingThread = 0;
-    constexpr int kIdle = 3 << 13;
-    ::syscall(SYS_ioprio_set, kOneThread, kCallingThread, kIdle);
-}
-
-} // namespace
-
-ThumbnailThread::ThumbnailThread(DrawThumbnail draw, Haste haste, std::function<void()> whenDone)
-    : mDraw(std::move(draw)),
-      mHaste(haste),
-      mWhenDone(std::move(whenDone)),
-      mThread([this] { run(); }) {}
+ThumbnailThread::ThumbnailThread(DrawThumbnail draw, std::function<void()> whenDone)
+    : mDraw(std::move(draw)), mWhenDone(std::move(whenDone)), mThread([this] { run(); }) {}
 
 ThumbnailThread::~ThumbnailThread() {
     stop();
@@ -60,9 +36,6 @@ std::optional<std::vector<Drawn>> ThumbnailThread::take() {
 }
 
 std::vector<Drawn> ThumbnailThread::stop() {
-    // Whoever waits should not wait for an idle machine, where we have the right to change that.
-    if (mHaste == Haste::kWhenIdle)
-        setPolicy(mThread.native_handle(), SCHED_OTHER);
     std::unique_lock lock(mMutex);
     mClosed = true;
     mChanged.notify_all();
@@ -71,15 +44,13 @@ std::vector<Drawn> ThumbnailThread::stop() {
 }
 
 void ThumbnailThread::run() {
-    if (mHaste == Haste::kWhenIdle) {
-        setPolicy(::pthread_self(), SCHED_IDLE);
-        readOnlyWhenDiskIsIdle();
-    }
     while (Drawn* const drawn = next()) {
         discoverer::Thumbnail failed;
         failed.result = LibMediaPlayer::kInternal;
-        drawn->thumbnail =
+        auto thumbnail =
             handle::guarded(std::move(failed), [&] { return mDraw(drawn->missing.path); });
+        if (thumbnail.result != LibMediaPlayer::kCancelled)
+            drawn->thumbnail = std::move(thumbnail);
     }
 }
 

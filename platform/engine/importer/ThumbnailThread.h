@@ -14,18 +14,15 @@
 
 namespace importer {
 
-/** Draws a thumbnail of a file, in a bounded time whatever the file. */
+/** Draws a thumbnail of a file, in a bounded time whatever the file; kCancelled: did not want to.
+ */
 using DrawThumbnail = std::function<discoverer::Thumbnail(const std::string& path)>;
 
-/** What a thumbnail is drawn for, and what came of it; nothing when it was not begun. */
+/** What a thumbnail is drawn for, and what came of it; nothing when it was not begun or finished.
+ */
 struct Drawn {
     library::MissingThumbnail missing;
     std::optional<discoverer::Thumbnail> thumbnail;
-};
-
-enum class Haste {
-    kNormal,
-    kWhenIdle ///< only while the machine, processor and disk, has nothing else to do
 };
 
 /**
@@ -35,7 +32,7 @@ enum class Haste {
 class ThumbnailThread {
 public:
     /** `whenDone` is called on the drawing thread when a portion is done. */
-    ThumbnailThread(DrawThumbnail draw, Haste haste, std::function<void()> whenDone);
+    ThumbnailThread(DrawThumbnail draw, std::function<void()> whenDone);
     /** Waits for the one that is being drawn. */
     ~ThumbnailThread();
     ThumbnailThread(const ThumbnailThread&) = delete;
@@ -55,7 +52,6 @@ private:
     Drawn* next();
 
     const DrawThumbnail mDraw;
-    const Haste mHaste;
     const std::function<void()> mWhenDone;
     std::mutex mMutex; ///< guards the next four; an element is the thread's while it is drawn
     std::condition_variable mChanged;

@@ -18,9 +18,9 @@ constexpr int kPortion = 8;
 } // namespace
 
 Thumbnails::Thumbnails(const Options& options, JobQueue& queue, Catalogue& catalogue)
-    : mCatalogue(catalogue) {
+    : mStopDrawing(options.stopDrawing), mCatalogue(catalogue) {
     if (options.drawThumbnail)
-        mThread.emplace(options.drawThumbnail, options.drawingHaste, [&queue] { queue.wake(); });
+        mThread.emplace(options.drawThumbnail, [&queue] { queue.wake(); });
 }
 
 void Thumbnails::tend() {
@@ -40,6 +40,8 @@ void Thumbnails::tend() {
 void Thumbnails::stop() {
     if (!mThread)
         return;
+    if (mStopDrawing)
+        mStopDrawing();
     for (Drawn& drawn : mThread->stop())
         mDrawn.push_back(std::move(drawn));
     if (mCatalogue.exists())

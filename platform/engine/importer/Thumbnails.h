@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <functional>
 #include <optional>
 #include <vector>
 
@@ -31,6 +32,7 @@ private:
     static void keep(library::Database& database, const Drawn& drawn);
     void drawNext();
 
+    const std::function<void()> mStopDrawing; ///< may be empty
     Catalogue& mCatalogue;
     std::optional<ThumbnailThread> mThread; ///< none when nobody wants thumbnails
     std::vector<Drawn> mDrawn;              ///< not yet in the database

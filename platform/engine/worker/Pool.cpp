@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include "worker/Pool.h"
 
+#include <algorithm>
 #include <cerrno>
 #include <cstdlib>
 #include <dlfcn.h>
@@ -12,6 +13,7 @@
 #include "LibMediaPlayer/Result.h"
 #include "qnsys.h"
 #include "worker/Message.h"
+#include "worker/Server.h"
 
 namespace worker {
 
@@ -55,14 +57,41 @@ std::variant<std::string, int> Pool::ask(const Question& question) {
     auto process = take();
     if (!process)
         return kNotAvailable;
-    MessageWriter message;
-    Request request = question.request;
-    message(request);
-    Process::Answer answer = process->ask(message.bytes(), question.files, question.patience);
+    Process::Answer answer = askBusy(*process, question);
+    if (isCancelled())
+        return kCancelled;
     if (answer.outcome != Process::Outcome::kAnswered)
         return lose(std::move(process), answer.outcome, question.name);
     giveBack(std::move(process));
     return std::move(answer.bytes);
+}
+
+Process::Answer Pool::askBusy(Process& process, const Question& question) {
+    MessageWriter message;
+    Request request = question.request;
+    message(request);
+    {
+        const std::lock_guard lock(mMutex);
+        mBusy.push_back(&process);
+        if (mCancelled)
+            process.hangUp();
+    }
+    Process::Answer answer = process.ask(message.bytes(), question.files, question.patience);
+    const std::lock_guard lock(mMutex);
+    mBusy.erase(std::find(mBusy.begin(), mBusy.end(), &process));
+    return answer;
+}
+
+void Pool::cancel() {
+    const std::lock_guard lock(mMutex);
+    mCancelled = true;
+    for (Process* const process : mBusy)
+        process->hangUp();
+}
+
+bool Pool::isCancelled() {
+    const std::lock_guard lock(mMutex);
+    return mCancelled;
 }
 
 std::unique_ptr<Process> Pool::take() {
@@ -83,7 +112,7 @@ std::unique_ptr<Process> Pool::takeIdle() {
 }
 
 std::unique_ptr<Process> Pool::start() const {
-    auto process = Process::start(mProgram);
+    auto process = Process::start(mProgram, mHaste == Haste::kWhenIdle ? kIdleOption : nullptr);
     if (!process)
         qnsys_syslog(LOG_ERR, "Media worker cannot be started: %s: %s", mProgram.c_str(),
                      std::generic_category().message(errno).c_str());

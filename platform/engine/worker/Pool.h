@@ -17,14 +17,20 @@ namespace worker {
  * library. */
 std::string defaultProgram();
 
+/** When workers run. */
+enum class Haste {
+    kNormal,
+    kWhenIdle ///< only while the machine, processor and disk, has nothing else to do
+};
+
 /**
  * Worker processes, so that a file that crashes, hangs or swells what reads it costs the question
- * about that file and nothing else. As many run as are asked at once; two of them stay. Workers
- * inherit the scheduling of the thread whose question made them start. Any thread.
+ * about that file and nothing else. As many run as are asked at once; two of them stay. Any thread.
  */
 class Pool {
 public:
-    explicit Pool(std::string program = defaultProgram()) : mProgram(std::move(program)) {}
+    explicit Pool(std::string program = defaultProgram(), Haste haste = Haste::kNormal)
+        : mProgram(std::move(program)), mHaste(haste) {}
 
     /** The one that serves who asks for somebody who waits. */
     static Pool& shared();
@@ -42,16 +48,25 @@ public:
     /** The answer's bytes, or a LibMediaPlayer::Result when there is none. Ends in time. */
     std::variant<std::string, int> ask(const Question& question);
 
+    /** From now on every question, also those that wait, is answered by kCancelled. */
+    void cancel();
+
 private:
     std::unique_ptr<Process> take();
     std::unique_ptr<Process> takeIdle();
     std::unique_ptr<Process> start() const;
+    Process::Answer askBusy(Process& process, const Question& question);
     void giveBack(std::unique_ptr<Process> process);
     int lose(std::unique_ptr<Process> process, Process::Outcome outcome, const std::string& name);
 
+    [[nodiscard]] bool isCancelled();
+
     const std::string mProgram;
+    const Haste mHaste;
     std::mutex mMutex; ///< guards what follows
     std::vector<std::unique_ptr<Process>> mIdle;
+    std::vector<Process*> mBusy;
+    bool mCancelled = false;
 };
 
 } // namespace worker

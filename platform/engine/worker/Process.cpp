@@ -73,14 +73,13 @@ std::string describe(int status) {
 
 } // namespace
 
-std::unique_ptr<Process> Process::start(const std::string& program) {
+std::unique_ptr<Process> Process::start(const std::string& program, const char* option) {
     int ends[2];
     if (::socketpair(AF_UNIX, SOCK_SEQPACKET | SOCK_CLOEXEC, 0, ends) != 0)
         return nullptr;
     qns::UniqueFd ours(ends[0]);
     const qns::UniqueFd theirs(ends[1]);
-    std::string name = program;
-    char* arguments[] = {name.data(), nullptr};
+    char* arguments[] = {const_cast<char*>(program.c_str()), const_cast<char*>(option), nullptr};
     pid_t pid = 0;
     const SpawnActions actions(theirs.get());
     const SpawnAttributes attributes;
@@ -116,6 +115,10 @@ bool Process::awaitReady(std::chrono::milliseconds time) {
         mReady = awaitParcel(mSocket.get(), steady_clock::now() + time) &&
                  receive(mSocket.get()).has_value();
     return mReady;
+}
+
+void Process::hangUp() const {
+    ::shutdown(mSocket.get(), SHUT_RDWR);
 }
 
 bool Process::isIdle() const {

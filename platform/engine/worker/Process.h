@@ -27,8 +27,11 @@ public:
         std::string bytes; ///< when it answered
     };
 
-    /** Begins to start `program`, without waiting for it. Null, and errno, when it cannot. */
-    static std::unique_ptr<Process> start(const std::string& program);
+    /**
+     * Begins to start `program`, with an option unless that is null, without waiting for it. Null,
+     * and errno, when it cannot.
+     */
+    static std::unique_ptr<Process> start(const std::string& program, const char* option);
 
     /** Kills it. */
     ~Process();
@@ -42,6 +45,9 @@ public:
     };
 
     Answer ask(std::string_view request, const std::vector<int>& files, Patience patience);
+
+    /** Ends the connection, so that ask() returns. Any thread. */
+    void hangUp() const;
 
     /** False when it has ended, or said something unasked. */
     [[nodiscard]] bool isIdle() const;

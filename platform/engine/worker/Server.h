@@ -12,6 +12,9 @@ namespace worker {
 /** Where a worker finds its end of the socket. */
 inline constexpr int kServerSocket = 3;
 
+/** The argument of a worker that is to run only while the machine has nothing else to do. */
+inline constexpr char kIdleOption[] = "--when-idle";
+
 /** False in a process that somebody started by hand. */
 bool isStartedByEngine();
 
