@@ -33,6 +33,7 @@ if(QNS_SANITIZE)
     add_compile_options(-fsanitize=${QNS_SANITIZE} -fno-sanitize-recover=all
         -fno-omit-frame-pointer)
     add_link_options(-fsanitize=${QNS_SANITIZE})
+    add_compile_definitions(QNS_SANITIZED) # for what sanitizers do not get on with
     if(QNS_SANITIZE MATCHES "undefined")
         # It looks at memory through a pipe of its own, and takes every object for a broken one
         # when there are no more descriptors: tests use them all up.

@@ -8,6 +8,7 @@
 #include <string>
 #include <string_view>
 #include <type_traits>
+#include <utility>
 
 namespace worker {
 
@@ -101,8 +102,11 @@ private:
         bool isThere = false;
         read(isThere);
         value.reset();
-        if (isThere && mGood)
-            read(value.emplace());
+        if (!isThere || !mGood)
+            return;
+        Value inner;
+        read(inner);
+        value = std::move(inner);
     }
     template<typename Value, std::size_t size>
     void read(std::array<Value, size>& values) {

@@ -16,6 +16,13 @@ namespace worker {
 
 namespace {
 
+/** The sanitizers map all of memory, and make calls of their own. */
+#ifdef QNS_SANITIZED
+constexpr bool kNeedsEverything = true;
+#else
+constexpr bool kNeedsEverything = false;
+#endif
+
 /** The largest picture with what its decoder keeps, twice over. */
 constexpr rlim_t kMemory = 1536UL * 1024 * 1024;
 
@@ -64,7 +71,7 @@ constexpr int kAllowed[] = {
 /** Memory, but none that can be run. */
 void allowMappings(scmp_filter_ctx filter) {
     constexpr unsigned int kProtection = 2;
-    const auto notToRun = SCMP_CMP(kProtection, SCMP_CMP_MASKED_EQ, PROT_EXEC, 0);
+    const scmp_arg_cmp notToRun{kProtection, SCMP_CMP_MASKED_EQ, PROT_EXEC, 0};
     ::seccomp_rule_add(filter, SCMP_ACT_ALLOW, SCMP_SYS(mmap), 1, notToRun);
     ::seccomp_rule_add(filter, SCMP_ACT_ALLOW, SCMP_SYS(mprotect), 1, notToRun);
 }
@@ -85,10 +92,10 @@ void filterSystemCalls() {
 
 void enterSandbox() {
     dieFirst();
-#ifndef QNS_SANITIZED // the sanitizers map all of memory, and need calls of their own
+    if (kNeedsEverything)
+        return;
     limitResources();
     filterSystemCalls();
-#endif
 }
 
 } // namespace worker
