@@ -90,6 +90,9 @@ public:
     void replace(int standard, int fd) {
         ::posix_spawn_file_actions_adddup2(&mActions, fd, standard);
     }
+    void discard(int standard) {
+        ::posix_spawn_file_actions_addopen(&mActions, standard, "/dev/null", O_WRONLY, 0);
+    }
     void closeAll() {
         for (const int fd : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO})
             ::posix_spawn_file_actions_addclose(&mActions, fd);
@@ -153,6 +156,8 @@ DaemonProcess::DaemonProcess(const DaemonOptions& options) {
         fill(fullPipe.write.get());
         files.replace(STDOUT_FILENO, fullPipe.write.get());
     }
+    if (options.output == DaemonOptions::Output::discarded)
+        files.discard(STDOUT_FILENO);
     mPid = spawn(options, files);
     mFullPipe = std::move(fullPipe.read);
     mRead = std::move(pipe.read);

@@ -21,8 +21,11 @@
 struct DaemonOptions {
     std::string program = QNS_DAEMON;
 
-    /** Where standard output goes. Standard error goes with it, but not into the full pipe. */
-    enum class Output { captured, closed, fullPipe };
+    /**
+     * Where standard output goes. Standard error goes with it, but not into the full pipe, and is
+     * captured where standard output is discarded.
+     */
+    enum class Output { captured, closed, fullPipe, discarded };
 
     std::vector<std::string> arguments;
 

@@ -21,14 +21,13 @@ long notifyObject(const WireService& service) {
 
 std::int32_t Life::registerCallBack(const WireService& service) {
     sendRegistration(service);
-    const auto answer = receive();
-    if (!answer) {
+    const auto reply = receive();
+    if (!reply) {
         ADD_FAILURE() << "No answer to the registration of " << identity();
         return -1;
     }
-    const auto id = wire::readInt32(answer->payload);
-    EXPECT_EQ(*answer, (Packet{receiverOf(identity()), callbackObject(service), 1, true, true,
-                               wire::int32(id)}));
+    const auto id = wire::readInt32(reply->payload);
+    EXPECT_EQ(*reply, answer(service, 1, wire::int32(id)));
     return id;
 }
 
@@ -48,12 +47,15 @@ void Life::request(const WireService& service, long method, const wire::Bytes& a
 }
 
 void Life::expectCallBack(const WireService& service, long method, const wire::Bytes& arguments) {
-    EXPECT_EQ(receive(), (Packet{receiverOf(identity()), callbackObject(service), method, true,
-                                 true, arguments}));
+    EXPECT_EQ(receive(), answer(service, method, arguments));
 }
 
 void Life::expectResult(const WireService& service, long method, std::int32_t result) {
     expectCallBack(service, method, wire::int32(result));
+}
+
+Packet Life::answer(const WireService& service, long method, const wire::Bytes& arguments) const {
+    return {receiverOf(identity()), callbackObject(service), method, true, true, arguments};
 }
 
 Packet Life::notification(const WireService& service, const wire::Bytes& arguments) const {

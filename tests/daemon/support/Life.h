@@ -43,6 +43,9 @@ public:
     void expectCallBack(const WireService& service, long method, const wire::Bytes& arguments);
     void expectResult(const WireService& service, long method, std::int32_t result);
 
+    /** What the daemon sends to the service's callback object, or to its notify object. */
+    [[nodiscard]] wire::Packet answer(const WireService& service, long method,
+                                      const wire::Bytes& arguments) const;
     [[nodiscard]] wire::Packet notification(const WireService& service,
                                             const wire::Bytes& arguments) const;
 

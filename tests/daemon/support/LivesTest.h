@@ -2,28 +2,15 @@
 #pragma once
 
 #include <csignal>
-#include <cstddef>
 #include <string>
 #include <utility>
 #include <vector>
 
 #include "tests/cli/support/Tool.h"
 #include "tests/daemon/support/DaemonTest.h"
+#include "tests/daemon/support/Memory.h"
 #include "tests/daemon/support/SampleMedia.h"
 #include "tests/support/TestFolder.h"
-
-#if defined(__SANITIZE_ADDRESS__) || defined(__SANITIZE_THREAD__)
-inline constexpr bool kMemoryTells = false; // what is freed is kept for a while, to be looked at
-#else
-inline constexpr bool kMemoryTells = true;
-#endif
-
-/** Bytes that the daemon uses more than before; told in the test's report. */
-inline long memoryGrownSince(const DaemonProcess& daemon, std::size_t before) {
-    const auto grown = static_cast<long>(daemon.residentBytes() - before);
-    testing::Test::RecordProperty("grown", std::to_string(grown));
-    return kMemoryTells ? grown : 0;
-}
 
 /** A daemon that serves clients that restart, with the engine that plays. */
 class LivesTest : public DaemonTest {

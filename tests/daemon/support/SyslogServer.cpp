@@ -9,6 +9,7 @@
 #include <sys/socket.h>
 #include <sys/un.h>
 #include <unistd.h>
+#include <utility>
 
 #include <gtest/gtest.h>
 
@@ -55,6 +56,11 @@ void SyslogServer::stopReading() {
     mThread.join();
 }
 
+void SyslogServer::keepOnly(std::string text) {
+    const std::lock_guard lock(mReadMutex);
+    mKept = std::move(text);
+}
+
 std::vector<std::string> SyslogServer::lines(std::string_view text) {
     if (!mStopped)
         readAvailable();
@@ -84,6 +90,7 @@ void SyslogServer::readAvailable() {
         std::string line(buffer.data(), static_cast<std::size_t>(length));
         while (!line.empty() && (line.back() == '\0' || line.back() == '\n'))
             line.pop_back();
-        mLines.add(std::move(line));
+        if (line.find(mKept) != std::string::npos)
+            mLines.add(std::move(line));
     }
 }

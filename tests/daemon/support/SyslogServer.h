@@ -22,6 +22,9 @@ public:
     /** From now on what is sent here waits in the socket's short queue, and then blocks. */
     void stopReading();
 
+    /** From now on lines are read and only those with this text are kept. */
+    void keepOnly(std::string text);
+
     /** Waits for a line that contains `text`. */
     bool waitForLine(std::string_view text, std::size_t count = 1) {
         return mLines.waitFor(text, count);
@@ -40,7 +43,8 @@ private:
 
     qns::UniqueFd mSocket;
     std::atomic<bool> mStopped{false};
-    std::mutex mReadMutex; ///< held while reading
+    std::mutex mReadMutex; ///< held while reading; guards mKept
+    std::string mKept;     ///< what a line must contain to be kept
     Lines mLines;
     std::thread mThread;
 };

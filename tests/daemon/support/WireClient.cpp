@@ -58,6 +58,22 @@ qns::UniqueFd listenOn(long port) {
     return socket;
 }
 
+qns::UniqueFd connectToDaemon(int receiveBuffer) {
+    const auto deadline = patience::deadline();
+    do {
+        auto connection = makeSocket();
+        if (receiveBuffer > 0)
+            setOption(connection.get(), SOL_SOCKET, SO_RCVBUF, receiveBuffer);
+        if (tryConnect(connection.get())) {
+            setOption(connection.get(), IPPROTO_TCP, TCP_NODELAY, 1);
+            return connection;
+        }
+        std::this_thread::sleep_for(std::chrono::milliseconds(5));
+    } while (Clock::now() < deadline);
+    ADD_FAILURE() << "Nobody listens on the daemon's port: " << std::strerror(errno);
+    return {};
+}
+
 WireClient::WireClient(long identity) : mIdentity(identity) {
     startListening();
 }
@@ -73,19 +89,8 @@ void WireClient::startListening() {
 }
 
 void WireClient::connect(int receiveBuffer) {
-    const auto deadline = patience::deadline();
-    do {
-        mConnection = makeSocket();
-        if (receiveBuffer > 0)
-            setOption(mConnection.get(), SOL_SOCKET, SO_RCVBUF, receiveBuffer);
-        if (tryConnect(mConnection.get())) {
-            setOption(mConnection.get(), IPPROTO_TCP, TCP_NODELAY, 1);
-            mAcknowledged = 0;
-            return;
-        }
-        std::this_thread::sleep_for(std::chrono::milliseconds(5));
-    } while (Clock::now() < deadline);
-    ADD_FAILURE() << "Nobody listens on the daemon's port: " << std::strerror(errno);
+    mConnection = connectToDaemon(receiveBuffer);
+    mAcknowledged = 0;
 }
 
 void WireClient::disconnect() {
@@ -98,6 +103,8 @@ void WireClient::sendBytes(std::string_view bytes) {
         const auto count = sendSome(bytes, std::chrono::milliseconds(100));
         bytes.remove_prefix(count);
         readAcknowledgements(Clock::now());
+        if (mMayEnd && mBroken)
+            return;
         if (Clock::now() > end) {
             mWaitedInVain = true;
             ADD_FAILURE() << "The daemon takes no more; " << bytes.size() << " bytes are left";
@@ -114,7 +121,8 @@ std::size_t WireClient::sendSome(std::string_view bytes, std::chrono::millisecon
             break;
         const auto count = ::send(mConnection.get(), bytes.data() + sent, bytes.size() - sent,
                                   MSG_NOSIGNAL | MSG_DONTWAIT);
-        if (count <= 0 && errno != EAGAIN)
+        mBroken = count <= 0 && errno != EAGAIN;
+        if (mBroken)
             break;
         sent += static_cast<std::size_t>(std::max<ssize_t>(count, 0));
     }

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <atomic>
 #include <cstddef>
 #include <list>
 #include <optional>
@@ -14,6 +15,9 @@ constexpr long kDaemonPort = 1008;
 
 /** A socket that listens on 127.0.0.1. Fails the test when the port is taken. */
 qns::UniqueFd listenOn(long port);
+
+/** A connection to the daemon, as soon as it listens. A positive `receiveBuffer` is set before. */
+qns::UniqueFd connectToDaemon(int receiveBuffer = 0);
 
 /**
  * A client process's end of the transport: listens on the port that is its identity, connects
@@ -35,6 +39,9 @@ public:
     /** Connects to the daemon, as soon as it listens. A positive `receiveBuffer` is set before. */
     void connect(int receiveBuffer = 0);
     void disconnect();
+
+    /** From now on the daemon may end: what it does not take any more is no failure. Any thread. */
+    void expectEnd() { mMayEnd = true; }
 
     /** Writes all of it; the client must be connected. */
     void sendBytes(std::string_view bytes);
@@ -83,6 +90,8 @@ private:
     long mIdentity;
     bool mAcknowledges = true;
     bool mWaitedInVain = false;
+    std::atomic<bool> mMayEnd{false};
+    bool mBroken = false; ///< the connection to the daemon
     qns::UniqueFd mListener;
     qns::UniqueFd mConnection;
     std::size_t mAcknowledged = 0; ///< bytes
