@@ -9,6 +9,7 @@
 #include <gtest/gtest.h>
 
 #include "probe/MediaFile.h"
+#include "tests/engine/Matroska.h"
 #include "tests/engine/truth/Truth.h"
 
 using namespace std::chrono_literals;
@@ -93,4 +94,12 @@ TEST_F(Duration, OfARecordingIsReadFromItsEnd) {
         EXPECT_NEAR(std::chrono::duration<double>(duration.time).count(), 20, 0.06) << name;
         EXPECT_TRUE(duration.isMeasured) << name;
     }
+}
+
+TEST_F(Duration, ThatNoClockCanCountIsTheLongestOfAll) {
+    constexpr std::uint64_t kManyYears = 0x4331c37937e08000; // 5e15 as a double
+    const auto duration = of(matroska::file(matroska::soundTrack(1), kManyYears));
+    EXPECT_EQ(duration.time,
+              std::chrono::floor<std::chrono::microseconds>(std::chrono::nanoseconds::max()));
+    EXPECT_EQ(of(matroska::file(matroska::soundTrack(1))).time, 5s);
 }

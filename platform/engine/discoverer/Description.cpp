@@ -123,8 +123,8 @@ private:
         const AVCodecParameters& known = *stream.codecpar;
         video.mediaType = codecType(known);
         video.description = codecDescription(known);
-        video.width = known.width;
-        video.height = known.height;
+        video.width = toInt(known.width);
+        video.height = toInt(known.height);
         video.depth = depthOf(known.format);
         const AVRational rate = frameRate(stream, mFile.isPicture());
         video.frameRateNumerator = rate.num;
@@ -143,8 +143,8 @@ private:
         const AVCodecParameters& known = *stream.codecpar;
         audio.mediaType = codecType(known);
         audio.description = codecDescription(known);
-        audio.channels = known.ch_layout.nb_channels;
-        audio.sampleRate = known.sample_rate;
+        audio.channels = toInt(known.ch_layout.nb_channels);
+        audio.sampleRate = toInt(known.sample_rate);
         audio.depth = depthOf(known);
         audio.bitRate = toInt(known.bit_rate);
         audio.maxBitRate = maxBitRate(stream);

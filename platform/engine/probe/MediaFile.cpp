@@ -40,6 +40,13 @@ std::int64_t durationOfStreams(const AVFormatContext& context) {
     return longest;
 }
 
+/** A header can tell of more years than nanoseconds can count. */
+std::chrono::nanoseconds toldDuration(const AVFormatContext& context) {
+    using std::chrono::microseconds;
+    constexpr auto kLongest = std::chrono::floor<microseconds>(std::chrono::nanoseconds::max());
+    return std::clamp(microseconds(context.duration), microseconds(0), kLongest);
+}
+
 /** Formats whose header tells everything of a file that holds nothing but sound ... */
 constexpr std::string_view kTellOfSound[] = {"aiff", "asf", "au",  "caf", "flac",
                                              "mp3",  "ogg", "tta", "wav", "wv"};
@@ -201,7 +208,7 @@ bool MediaFile::isEstimate() {
 const Duration& MediaFile::duration() {
     if (std::exchange(mDurationKnown, true) || isPicture())
         return mDuration;
-    mDuration.time = std::chrono::microseconds(std::max<std::int64_t>(mContext->duration, 0));
+    mDuration.time = toldDuration(*mContext.get());
     if (!isEstimate()) {
         mDuration.isMeasured =
             mAnalysed && mContext->duration_estimation_method == AVFMT_DURATION_FROM_PTS;
