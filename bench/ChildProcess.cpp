@@ -7,6 +7,8 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include "base/UniqueFd.h"
+
 namespace bench {
 
 ChildProcess ChildProcess::call(const std::function<void()>& body) {
@@ -32,8 +34,10 @@ ChildProcess ChildProcess::run(const std::vector<std::string>& command, int outp
     });
 }
 
-void ChildProcess::waitForEnd() {
-    ::waitpid(std::exchange(mPid, -1), nullptr, 0);
+int ChildProcess::waitForEnd() {
+    int status = 0;
+    ::waitpid(std::exchange(mPid, -1), &status, 0);
+    return WIFSIGNALED(status) ? 128 + WTERMSIG(status) : WEXITSTATUS(status);
 }
 
 ChildProcess::~ChildProcess() {
@@ -41,6 +45,22 @@ ChildProcess::~ChildProcess() {
         return;
     ::kill(mPid, SIGTERM);
     ::waitpid(mPid, nullptr, 0);
+}
+
+Finished runToEnd(const std::vector<std::string>& command) {
+    int ends[2];
+    if (::pipe2(ends, O_CLOEXEC) != 0)
+        return {127, {}};
+    const qns::UniqueFd readEnd(ends[0]);
+    qns::UniqueFd writeEnd(ends[1]);
+    ChildProcess child = ChildProcess::run(command, writeEnd.get());
+    writeEnd.reset();
+    Finished finished;
+    char part[4096];
+    for (ssize_t size = 0; (size = ::read(readEnd.get(), part, sizeof part)) > 0;)
+        finished.output.append(part, static_cast<std::size_t>(size));
+    finished.status = child.waitForEnd();
+    return finished;
 }
 
 } // namespace bench

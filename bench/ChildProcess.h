@@ -27,13 +27,21 @@ public:
 
     [[nodiscard]] pid_t pid() const { return mPid; }
 
-    /** Until it ends by itself. */
-    void waitForEnd();
+    /** Until it ends by itself. Its exit status; 128 and the signal's number when one ended it. */
+    int waitForEnd();
 
 private:
     explicit ChildProcess(pid_t pid) : mPid(pid) {}
 
     pid_t mPid = -1;
 };
+
+/** What a program that has ended leaves. */
+struct Finished {
+    int status = 0;     ///< as waitForEnd() tells it
+    std::string output; ///< all that it wrote to its standard output
+};
+
+Finished runToEnd(const std::vector<std::string>& command);
 
 } // namespace bench

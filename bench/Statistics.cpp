@@ -18,7 +18,8 @@ Statistics summarize(std::vector<double> samples) {
     if (samples.empty())
         return {};
     std::sort(samples.begin(), samples.end());
-    return {percentile(samples, 0.5), percentile(samples, 0.99), samples.front(), samples.back()};
+    return {percentile(samples, 0.5), percentile(samples, 0.99), samples.front(), samples.back(),
+            static_cast<int>(samples.size())};
 }
 
 } // namespace bench

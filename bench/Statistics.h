@@ -11,6 +11,7 @@ struct Statistics {
     double p99 = 0;
     double minimum = 0;
     double maximum = 0;
+    int samples = 0;
 };
 
 [[nodiscard]] Statistics summarize(std::vector<double> samples);

@@ -16,14 +16,15 @@ struct Bench {
 };
 
 constexpr Bench kBenches[] = {
-    {"import", "import thousands of files and search them, beside MPD and minidlna",
-     bench::runImport},
-    {"media", "read and draw files, beside the libraries and commands that do", bench::runMedia},
+    {"rpc", "one request and its answer, beside bare sockets and D-Bus", bench::runRpc},
     {"pack", "encode and decode every value form, beside msgpack-c", bench::runPack},
     {"player", "open, seek, close and loop real files, beside libmpv", bench::runPlayer},
-    {"rpc", "one request and its answer, beside bare sockets and D-Bus", bench::runRpc},
     {"start", "start-up, memory and idle load, beside an empty QApplication and MPD",
      bench::runStart},
+    {"media", "read and draw files, beside the libraries and commands that do", bench::runMedia},
+    {"import", "import thousands of files, beside MPD and minidlna", bench::runImport},
+    {"scale", "how costs grow with clients, requests, listeners, discoverers and rows",
+     bench::runScale},
 };
 
 struct CommonOptions {
@@ -60,6 +61,7 @@ void addCommonOptions(CLI::App& command, CommonOptions& options) {
         ->check(CLI::Range(0, CPU_SETSIZE - 1));
     command.add_option("--rounds", options.bench.rounds, "how often to repeat each measurement")
         ->check(CLI::PositiveNumber);
+    command.add_flag("--quick", options.bench.quick, "see that it works: fewer and smaller");
     command.allow_extras();
 }
 

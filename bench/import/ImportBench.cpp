@@ -8,10 +8,10 @@
 #include <unistd.h>
 
 #include "bench/Benches.h"
+#include "bench/Programs.h"
 #include "bench/Report.h"
 #include "bench/import/Collection.h"
 #include "bench/import/Importers.h"
-#include "bench/import/LibraryRows.h"
 #include "bench/rpc/PacketSocket.h"
 
 namespace bench {
@@ -21,6 +21,8 @@ namespace fs = std::filesystem;
 
 constexpr int kDefaultRounds = 3;
 constexpr int kFiles = 2000;
+constexpr int kQuickFiles = 200;
+constexpr int kQuickCovers = 40; // thumbnails wait for an idle processor
 
 struct Contender {
     std::string name;
@@ -70,9 +72,11 @@ void compare(const std::string& name, const CollectionPlan& plan, const fs::path
     Collection collection{folder / "music", {}};
     collection.files = makeCollection(collection.folder, plan);
     ::sync();
-    std::vector<Contender> contenders = {{"daemon", importByDaemon, {}, {}, {}},
-                                         {"MPD", importByMpd, {}, {}, {}},
-                                         {"minidlna", importByMinidlna, {}, {}, {}}};
+    std::vector<Contender> contenders = {{"daemon", importByDaemon, {}, {}, {}}};
+    if (takesPart("MPD", "mpd", report))
+        contenders.push_back({"MPD", importByMpd, {}, {}, {}});
+    if (takesPart("minidlna", "minidlnad", report))
+        contenders.push_back({"minidlna", importByMinidlna, {}, {}, {}});
     for (int round = 0; round < rounds; ++round)
         for (Contender& contender : contenders)
             runOnce(contender, collection, folder / "scratch");
@@ -83,10 +87,10 @@ void compare(const std::string& name, const CollectionPlan& plan, const fs::path
 } // namespace
 
 int runImport(const Options& options, Report& report) {
-    if (!enterOwnNetwork())
-        std::fputs("qnsmedia-bench: no network of its own; using the machine's ports\n", stderr);
+    isolateNetwork();
     ::setenv("QT_QPA_PLATFORM", "offscreen", 0);
-    const int rounds = options.rounds > 0 ? options.rounds : kDefaultRounds;
+    const int rounds = roundsOf(options, kDefaultRounds, 1);
+    const int files = options.quick ? kQuickFiles : kFiles;
     const fs::path folder =
         fs::temp_directory_path() / ("qnsmedia-bench-" + std::to_string(::getpid()));
     const std::vector<std::string>& parts = options.arguments;
@@ -95,13 +99,12 @@ int runImport(const Options& options, Report& report) {
     };
     for (const char* const ending : {"mp3", "flac", "ogg", "m4a", "wav"}) {
         if (wanted(ending))
-            compare("import of " + std::string(ending), {kFiles, {ending}, false}, folder, rounds,
+            compare("import of " + std::string(ending), {files, {ending}, false}, folder, rounds,
                     report);
     }
     if (wanted("covers"))
-        compare("import of mp3 with covers", {kFiles, {"mp3"}, true}, folder, rounds, report);
-    if (wanted("rows"))
-        measureLibraryRows(rounds, report);
+        compare("import of mp3 with covers", {options.quick ? kQuickCovers : kFiles, {"mp3"}, true},
+                folder, rounds, report);
     fs::remove_all(folder);
     return 0;
 }

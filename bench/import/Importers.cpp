@@ -10,7 +10,7 @@
 #include <thread>
 
 #include "bench/ChildProcess.h"
-#include "bench/rpc/DaemonPeer.h"
+#include "bench/Programs.h"
 #include "bench/rpc/PacketSocket.h"
 #include "bench/start/ProcessUse.h"
 #include "qnsmedia/Connection.h"

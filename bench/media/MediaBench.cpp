@@ -3,21 +3,20 @@
 // the libraries called directly and the commands that people use.
 #include <algorithm>
 #include <chrono>
-#include <cstdio>
 #include <cstdlib>
-#include <fcntl.h>
+#include <deque>
 #include <filesystem>
 #include <fstream>
 #include <functional>
+#include <memory>
 #include <nlohmann/json.hpp>
-#include <sys/stat.h>
 #include <unistd.h>
 
 #include "bench/Benches.h"
 #include "bench/ChildProcess.h"
+#include "bench/Programs.h"
 #include "bench/Report.h"
 #include "bench/media/Readers.h"
-#include "bench/rpc/DaemonPeer.h"
 #include "bench/rpc/PacketSocket.h"
 
 namespace bench {
@@ -29,6 +28,7 @@ constexpr int kDefaultRounds = 5;
 
 struct Contender {
     std::string name;
+    Role role;
     std::function<void(const std::string& path)> work;
 };
 
@@ -38,9 +38,13 @@ double milliseconds(const std::function<void()>& work) {
     return std::chrono::duration<double, std::milli>(Clock::now() - begin).count();
 }
 
-/** The engine remembers what it has read, unless it has just changed. */
-void touch(const std::string& file) {
-    ::utimensat(AT_FDCWD, file.c_str(), nullptr, 0);
+Row rowOf(const std::string& name, const std::vector<Contender>& contenders,
+          std::vector<std::vector<double>> samples) {
+    Row row{name, "ms", {}};
+    for (std::size_t i = 0; i < contenders.size(); ++i)
+        row.entries.push_back(
+            {contenders[i].name, summarize(std::move(samples[i])), contenders[i].role});
+    return row;
 }
 
 /** Each contender's median for each file, all of them in turn. */
@@ -57,21 +61,35 @@ Row compare(const std::string& name, const std::vector<std::string>& files, int 
         for (std::size_t i = 0; i < contenders.size(); ++i)
             medians[i].push_back(summarize(std::move(samples[i])).median);
     }
-    Row row{name, "ms", {}};
-    for (std::size_t i = 0; i < contenders.size(); ++i)
-        row.entries.push_back({contenders[i].name, summarize(std::move(medians[i]))});
-    return row;
+    return rowOf(name, contenders, std::move(medians));
+}
+
+/** The same, but each has one file again and again before the next contender has it. */
+Row compareRepeated(const std::string& name, const std::vector<std::string>& files, int rounds,
+                    const std::vector<Contender>& contenders) {
+    std::vector<std::vector<double>> medians(contenders.size());
+    for (const std::string& file : files)
+        for (std::size_t i = 0; i < contenders.size(); ++i) {
+            std::vector<double> samples;
+            for (int round = 0; round < rounds * 5; ++round) {
+                touch(file);
+                samples.push_back(milliseconds([&] { contenders[i].work(file); }));
+            }
+            medians[i].push_back(summarize(std::move(samples)).median);
+        }
+    return rowOf(name, contenders, std::move(medians));
 }
 
 /** The files that can be read, and of these those that are films of two seconds. */
 struct MediaSet {
+    std::filesystem::path folder;
     std::vector<std::string> all;
     std::vector<std::string> films;
 };
 
 MediaSet makeMedia(const std::filesystem::path& folder) {
     const std::string make = std::string(QNS_MAKE_TRUTH) + " '" + folder.string() + "' 2>/dev/null";
-    MediaSet set;
+    MediaSet set{folder, {}, {}};
     if (std::system(make.c_str()) != 0)
         return set;
     std::ifstream file(folder / "truth.json");
@@ -89,71 +107,70 @@ MediaSet makeMedia(const std::filesystem::path& folder) {
     return set;
 }
 
-Row compareReaders(qnsmedia::Connection& connection, const MediaSet& set, int rounds) {
-    const auto daemon = makeDaemonReader(connection);
+/** The engine beside the library that it could have left the work to. */
+void compareLibraries(const MediaSet& set, int rounds, Report& report) {
     const auto engine = makeEngineReader();
     const auto libav = makeLibavReader();
-    const auto ffprobe = makeCommandReader(
-        {"ffprobe", "-v", "quiet", "-of", "json", "-show_format", "-show_streams"});
-    const auto mediainfo = makeCommandReader({"mediainfo", "--Output=JSON"});
-    const auto with = [](const std::unique_ptr<MediaReader>& reader) {
-        return [&reader](const std::string& path) { reader->read(path); };
+    const std::vector<Contender> contenders = {
+        {"engine", Role::ours, [&](const std::string& path) { engine->read(path); }},
+        {"libavformat", Role::peer, [&](const std::string& path) { libav->read(path); }}};
+    report.add(compareRepeated("metadata by the engine, repeated", set.all, rounds, contenders));
+    report.add(compare("metadata by the engine", set.all, rounds, contenders));
+}
+
+void compareReaders(qnsmedia::Connection& connection, const MediaSet& set, int rounds,
+                    Report& report) {
+    std::deque<std::unique_ptr<MediaReader>> readers;
+    std::vector<Contender> contenders;
+    const auto add = [&](const char* name, Role role, std::unique_ptr<MediaReader> reader) {
+        MediaReader& kept = *readers.emplace_back(std::move(reader));
+        contenders.push_back({name, role, [&kept](const std::string& path) { kept.read(path); }});
     };
-    return compare("metadata of a file", set.all, rounds,
-                   {{"engine", with(engine)},
-                    {"daemon", with(daemon)},
-                    {"libavformat", with(libav)},
-                    {"ffprobe", with(ffprobe)},
-                    {"mediainfo", with(mediainfo)}});
+    add("daemon", Role::ours, makeDaemonReader(connection));
+    add("engine alone", Role::floor, makeEngineReader());
+    if (takesPart("ffprobe", "ffprobe", report))
+        add("ffprobe", Role::peer,
+            makeCommandReader(
+                {"ffprobe", "-v", "quiet", "-of", "json", "-show_format", "-show_streams"}));
+    if (takesPart("mediainfo", "mediainfo", report))
+        add("mediainfo", Role::peer, makeCommandReader({"mediainfo", "--Output=JSON"}));
+    report.add(compare("metadata of a file", set.all, rounds, contenders));
 }
 
 /** The first picture is a key frame. */
-Row compareDrawers(qnsmedia::Connection& connection, const std::string& name, int second,
-                   const MediaSet& set, int rounds, const std::filesystem::path& folder) {
+void compareDrawers(qnsmedia::Connection& connection, const std::string& name, int second,
+                    const MediaSet& set, int rounds, Report& report) {
     const auto daemon = makeDaemonDrawer(connection);
     const auto thumbnailer = makeThumbnailerDrawer();
-    const std::string target = (folder / "picture.jpg").string();
+    const std::string target = (set.folder / "picture.jpg").string();
     const auto with = [&](const std::unique_ptr<PictureDrawer>& drawer) {
         return [&drawer, &target, second](const std::string& path) {
             drawer->draw(path, second, target);
         };
     };
-    return compare(name, set.films, rounds,
-                   {{"daemon", with(daemon)}, {"thumbnailer", with(thumbnailer)}});
-}
-
-Row compareTeams(qnsmedia::Connection& connection, const MediaSet& set, int rounds) {
-    Row row{"files a second with so many discoverers", "1/s", {}, Better::kHigher};
-    for (const std::size_t discoverers : {1U, 2U, 4U, 8U, 10U}) {
-        std::vector<double> rates;
-        for (int round = 0; round < rounds; ++round) {
-            std::for_each(set.all.begin(), set.all.end(), touch);
-            rates.push_back(static_cast<double>(set.all.size()) /
-                            readSideBySide(connection, set.all, discoverers));
-        }
-        row.entries.push_back({std::to_string(discoverers), summarize(std::move(rates))});
-    }
-    return row;
+    std::vector<Contender> contenders = {{"daemon", Role::ours, with(daemon)}};
+    if (takesPart("ffmpegthumbnailer", "ffmpegthumbnailer", report))
+        contenders.push_back({"ffmpegthumbnailer", Role::peer, with(thumbnailer)});
+    report.add(compare(name, set.films, rounds, contenders));
 }
 
 } // namespace
 
 int runMedia(const Options& options, Report& report) {
-    if (!enterOwnNetwork())
-        std::fputs("qnsmedia-bench: no network of its own; using the machine's ports\n", stderr);
+    isolateNetwork();
     const std::filesystem::path folder =
         std::filesystem::temp_directory_path() / ("qnsmedia-bench-" + std::to_string(::getpid()));
     const MediaSet set = makeMedia(folder);
     if (set.all.empty())
         return 1;
-    const int rounds = options.rounds > 0 ? options.rounds : kDefaultRounds;
+    const int rounds = roundsOf(options, kDefaultRounds, 1);
+    compareLibraries(set, rounds, report);
     const ChildProcess daemon = ChildProcess::run({programFolder() + "/QNSMediaService"});
     connectTo(1008);
     qnsmedia::Connection connection; // the only one: the daemon knows an identity once
-    report.add(compareReaders(connection, set, rounds));
-    report.add(compareDrawers(connection, "picture of a key frame", 0, set, rounds, folder));
-    report.add(compareDrawers(connection, "picture between key frames", 1, set, rounds, folder));
-    report.add(compareTeams(connection, set, rounds));
+    compareReaders(connection, set, rounds, report);
+    compareDrawers(connection, "picture of a key frame", 0, set, rounds, report);
+    compareDrawers(connection, "picture between key frames", 1, set, rounds, report);
     std::filesystem::remove_all(folder);
     return 0;
 }

@@ -2,9 +2,10 @@
 #include "bench/media/Readers.h"
 
 #include <chrono>
-#include <deque>
+#include <fcntl.h>
 #include <future>
 #include <stdexcept>
+#include <sys/stat.h>
 
 extern "C" {
 #include <libavformat/avformat.h>
@@ -131,20 +132,18 @@ std::unique_ptr<PictureDrawer> makeThumbnailerDrawer() {
     return std::make_unique<ThumbnailerDrawer>();
 }
 
-double readSideBySide(qnsmedia::Connection& connection, const std::vector<std::string>& files,
-                      std::size_t discoverers) {
-    std::deque<qnsmedia::Discoverer> team;
-    while (team.size() < discoverers)
-        team.emplace_back(connection);
+void touch(const std::string& file) {
+    ::utimensat(AT_FDCWD, file.c_str(), nullptr, 0);
+}
+
+double readSideBySide(const std::vector<std::unique_ptr<MediaReader>>& team,
+                      const std::vector<std::string>& files) {
     const auto begin = std::chrono::steady_clock::now();
     std::vector<std::future<void>> working;
     for (std::size_t first = 0; first < team.size(); ++first)
         working.push_back(std::async(std::launch::async, [&, first] {
-            for (std::size_t index = first; index < files.size(); index += team.size()) {
-                team[first].open(files[index]).get();
-                team[first].metadata().get();
-                team[first].close().get();
-            }
+            for (std::size_t index = first; index < files.size(); index += team.size())
+                team[first]->read(files[index]);
         }));
     for (std::future<void>& work : working)
         work.get();

@@ -35,8 +35,11 @@ public:
 std::unique_ptr<PictureDrawer> makeDaemonDrawer(qnsmedia::Connection& connection);
 std::unique_ptr<PictureDrawer> makeThumbnailerDrawer();
 
-/** How long the daemon takes for these files when that many discoverers share them; seconds. */
-double readSideBySide(qnsmedia::Connection& connection, const std::vector<std::string>& files,
-                      std::size_t discoverers);
+/** The engine remembers what it has read, unless it has just changed. */
+void touch(const std::string& file);
+
+/** How long it takes when the team shares the files, each member on its own thread; seconds. */
+double readSideBySide(const std::vector<std::unique_ptr<MediaReader>>& team,
+                      const std::vector<std::string>& files);
 
 } // namespace bench

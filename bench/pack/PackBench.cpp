@@ -156,7 +156,7 @@ void compareWideText(const Comparison& comparison, const std::string& name,
                            packText(theirBuffer.packer(), narrowedByC(text));
                            keep(theirBuffer.get());
                        }),
-                       theirs([&](unsigned) {
+                       theirsReady([&](unsigned) {
                            theirBuffer.clear();
                            packText(theirBuffer.packer(), narrowed);
                            keep(theirBuffer.get());
@@ -184,8 +184,9 @@ void comparePacking(const Comparison& comparison) {
 
 int runPack(const Options& options, Report& report) {
     constexpr int kRounds = 301;
+    constexpr int kQuickRounds = 31;
     std::setlocale(LC_ALL, ""); // for the C library's conversion
-    const Comparison comparison(report, options.rounds > 0 ? options.rounds : kRounds);
+    const Comparison comparison(report, roundsOf(options, kRounds, kQuickRounds));
     comparePacking(comparison);
     compareUnpacking(comparison);
     compareRecords(comparison);

@@ -71,7 +71,7 @@ void comparePackedRecord(const Comparison& comparison, const _tagMediaPlayerNoti
             keep(*ourBuffer.get());
         }),
         theirsNarrowing([&](unsigned) { runTheirs(narrowedByC(record.strNotifyText)); }),
-        theirs([&](unsigned) { runTheirs(kNarrowText); }));
+        theirsReady([&](unsigned) { runTheirs(kNarrowText); }));
 }
 
 /** As a notification is sent: the buffer is made for it and freed after it. */
@@ -90,7 +90,7 @@ void compareWholeRecord(const Comparison& comparison, const _tagMediaPlayerNotif
             keep(arguments);
         }),
         theirsNarrowing([&](unsigned) { runTheirs(narrowedByC(record.strNotifyText)); }),
-        theirs([&](unsigned) { runTheirs(kNarrowText); }));
+        theirsReady([&](unsigned) { runTheirs(kNarrowText); }));
 }
 
 _tagMediaPlayerNotify unpackOurs(const void* data, long size) {

@@ -19,6 +19,7 @@ using namespace std::chrono_literals;
 
 constexpr int kDefaultRounds = 15;
 constexpr int kLoopRounds = 5;
+constexpr int kQuickLoopRounds = 1;
 
 /** Key frames lie two seconds apart: this is far from one, and a little behind one. */
 constexpr Position kTargets[] = {11'700ms, 5'200ms};
@@ -61,10 +62,10 @@ void measure(PlayerPeer& player, const std::string& path, Samples& samples) {
     samples.close.push_back(player.close().count());
 }
 
-void measureLoop(PlayerPeer& player, const std::string& path, Samples& samples) {
+void measureLoop(PlayerPeer& player, const std::string& path, int rounds, Samples& samples) {
     player.open(path);
     const Milliseconds due = kLoopEnd - kLoopStart;
-    for (const Milliseconds time : player.loop(kLoopStart, kLoopEnd, kLoopRounds))
+    for (const Milliseconds time : player.loop(kLoopStart, kLoopEnd, rounds))
         samples.loopError.push_back(std::abs((time - due).count()));
     player.close();
 }
@@ -80,19 +81,17 @@ void addRows(Report& report, const std::string& what, const std::vector<Contende
 }
 
 /** Every contender in turn, so that whatever the machine does meets them all. */
-void measureFile(const std::filesystem::path& file, int rounds,
+void measureFile(const std::filesystem::path& file, int rounds, int loopRounds,
                  const std::vector<Contender>& contenders, Report& report) {
     std::vector<Samples> samples(contenders.size());
-    const auto forEach = [&](auto&& run) {
-        for (std::size_t i = 0; i < contenders.size(); ++i)
-            run(*contenders[i].pPlayer, file.string(), samples[i]);
-    };
     std::vector<Samples> unused(1);
     for (const Contender& contender : contenders) // what is read the first time only
         measure(*contender.pPlayer, file.string(), unused.front());
     for (int round = 0; round < rounds; ++round)
-        forEach(measure);
-    forEach(measureLoop);
+        for (std::size_t i = 0; i < contenders.size(); ++i)
+            measure(*contenders[i].pPlayer, file.string(), samples[i]);
+    for (std::size_t i = 0; i < contenders.size(); ++i)
+        measureLoop(*contenders[i].pPlayer, file.string(), loopRounds, samples[i]);
     addRows(report, file.filename().string(), contenders, samples);
 }
 
@@ -115,9 +114,10 @@ int runPlayer(const Options& options, Report& report) {
     std::vector<Contender> contenders;
     contenders.push_back({"engine", makeEnginePeer()});
     contenders.push_back({"libmpv", makeMpvPeer()});
-    const int rounds = options.rounds > 0 ? options.rounds : kDefaultRounds;
+    const int rounds = roundsOf(options, kDefaultRounds, 1);
+    const int loopRounds = options.quick ? kQuickLoopRounds : kLoopRounds;
     for (const std::filesystem::path& file : filesIn(folder))
-        measureFile(file, rounds, contenders, report);
+        measureFile(file, rounds, loopRounds, contenders, report);
     std::filesystem::remove_all(folder);
     return 0;
 }

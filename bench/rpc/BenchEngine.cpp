@@ -23,6 +23,7 @@ public:
     int open(const std::wstring&, int) override {
         MediaPlayerNotify opened;
         opened.type = kNotifyOpened;
+        opened.value = monotonicNanoseconds();
         if (mNotify)
             mNotify(opened);
         return kOk;
@@ -49,6 +50,15 @@ private:
 
 IMediaPlayer* InterfaceFactory::createPlayer(void*, unsigned int) {
     return new TimingPlayer;
+}
+
+// Only the player is measured with it.
+IMediaDiscoverer* InterfaceFactory::createDiscoverer() {
+    return nullptr;
+}
+
+IMediaImporter* InterfaceFactory::createImporter() {
+    return nullptr;
 }
 
 } // namespace LibMediaPlayer

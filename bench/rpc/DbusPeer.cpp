@@ -2,6 +2,7 @@
 #include "bench/rpc/DbusPeer.h"
 
 #include <chrono>
+#include <fcntl.h>
 #include <systemd/sd-bus.h>
 #include <thread>
 #include <unistd.h>
@@ -63,38 +64,30 @@ std::string readLine(int fd) {
     return line;
 }
 
-} // namespace
-
-DbusPeer::DbusPeer() {
+/** Runs a bus of its own; empty when that does not work. */
+std::string startBus(ChildProcess& daemon) {
     int ends[2];
-    if (::pipe(ends) != 0)
-        return;
+    if (::pipe2(ends, O_CLOEXEC) != 0)
+        return {};
     const qns::UniqueFd readEnd(ends[0]);
     {
         const qns::UniqueFd writeEnd(ends[1]);
-        mBusDaemon = ChildProcess::run({"dbus-daemon", "--session", "--nofork", "--nopidfile",
-                                        "--address=unix:tmpdir=/tmp", "--print-address"},
-                                       writeEnd.get());
+        daemon = ChildProcess::run({"dbus-daemon", "--session", "--nofork", "--nopidfile",
+                                    "--address=unix:tmpdir=/tmp", "--print-address"},
+                                   writeEnd.get());
     }
-    const std::string address = readLine(readEnd.get());
-    mService = ChildProcess::call([&] { serve(address); });
-    mpBus = connectBus(address);
-
-    const auto deadline = std::chrono::steady_clock::now() + std::chrono::seconds(10);
-    while (mpBus != nullptr && !call()) {
-        if (std::chrono::steady_clock::now() > deadline) {
-            mpBus = sd_bus_unref(mpBus);
-            return;
-        }
-        std::this_thread::sleep_for(std::chrono::milliseconds(5));
-    }
+    return readLine(readEnd.get());
 }
 
-DbusPeer::~DbusPeer() {
+} // namespace
+
+DbusConnection::DbusConnection(const std::string& address) : mpBus(connectBus(address)) {}
+
+DbusConnection::~DbusConnection() {
     sd_bus_flush_close_unref(mpBus);
 }
 
-bool DbusPeer::call() {
+bool DbusConnection::call() {
     sd_bus_message* reply = nullptr;
     int32_t status = 0;
     int32_t reserved = 0;
@@ -105,6 +98,25 @@ bool DbusPeer::call() {
         sd_bus_message_read(reply, "iixx", &status, &reserved, &position, &duration) > 0;
     sd_bus_message_unref(reply);
     return answered && status == 2;
+}
+
+DbusPeer::DbusPeer(int connections) {
+    const std::string address = startBus(mBusDaemon);
+    mService = ChildProcess::call([&] { serve(address); });
+    bool areConnected = true;
+    for (int i = 0; i < connections; ++i)
+        areConnected = mConnections.emplace_back(address).ready() && areConnected;
+    mReady = areConnected && awaitService();
+}
+
+bool DbusPeer::awaitService() {
+    const auto deadline = std::chrono::steady_clock::now() + std::chrono::seconds(10);
+    while (!mConnections.front().call()) {
+        if (std::chrono::steady_clock::now() > deadline)
+            return false;
+        std::this_thread::sleep_for(std::chrono::milliseconds(5));
+    }
+    return true;
 }
 
 } // namespace bench

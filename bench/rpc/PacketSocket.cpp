@@ -4,6 +4,7 @@
 #include <arpa/inet.h>
 #include <cerrno>
 #include <chrono>
+#include <cstdio>
 #include <cstring>
 #include <net/if.h>
 #include <netinet/in.h>
@@ -36,6 +37,18 @@ qns::UniqueFd makeSocket() {
 void disableNagle(int socket) {
     const int one = 1;
     ::setsockopt(socket, IPPROTO_TCP, TCP_NODELAY, &one, sizeof one);
+}
+
+bool enterOwnNetwork() {
+    if (::unshare(CLONE_NEWNET) != 0)
+        return false;
+    const qns::UniqueFd fd(::socket(AF_INET, SOCK_DGRAM | SOCK_CLOEXEC, 0));
+    ifreq request{};
+    std::strncpy(request.ifr_name, "lo", sizeof request.ifr_name - 1);
+    if (::ioctl(fd.get(), SIOCGIFFLAGS, &request) != 0)
+        return false;
+    request.ifr_flags |= IFF_UP;
+    return ::ioctl(fd.get(), SIOCSIFFLAGS, &request) == 0;
 }
 
 } // namespace
@@ -97,16 +110,9 @@ bool writePacket(int socket, const Packet& packet) {
     return true;
 }
 
-bool enterOwnNetwork() {
-    if (::unshare(CLONE_NEWNET) != 0)
-        return false;
-    const qns::UniqueFd fd(::socket(AF_INET, SOCK_DGRAM | SOCK_CLOEXEC, 0));
-    ifreq request{};
-    std::strncpy(request.ifr_name, "lo", sizeof request.ifr_name - 1);
-    if (::ioctl(fd.get(), SIOCGIFFLAGS, &request) != 0)
-        return false;
-    request.ifr_flags |= IFF_UP;
-    return ::ioctl(fd.get(), SIOCSIFFLAGS, &request) == 0;
+void isolateNetwork() {
+    if (!enterOwnNetwork())
+        std::fputs("qnsmedia-bench: no network of its own; using the machine's ports\n", stderr);
 }
 
 } // namespace bench

@@ -26,7 +26,10 @@ bool readPacket(int socket, Packet& packet);
 /** Drops acknowledgements that have come, then writes one packet. */
 bool writePacket(int socket, const Packet& packet);
 
-/** Gives this process a loopback network of its own, so that the fixed ports are free. */
-bool enterOwnNetwork();
+/**
+ * Gives this process a loopback network of its own, so that the fixed ports are free; where that
+ * is not allowed it says so and goes on with the machine's.
+ */
+void isolateNetwork();
 
 } // namespace bench

@@ -5,13 +5,15 @@
 #include <cstdio>
 #include <functional>
 #include <memory>
+#include <optional>
 #include <thread>
 
 #include "bench/Benches.h"
+#include "bench/Programs.h"
 #include "bench/Report.h"
 #include "bench/rpc/DaemonPeer.h"
 #include "bench/rpc/DbusPeer.h"
-#include "bench/rpc/FloorServer.h"
+#include "bench/rpc/FloorPeer.h"
 
 namespace bench {
 namespace {
@@ -24,26 +26,9 @@ constexpr int kCallsPerRound = 2000;
 constexpr int kSpacedCallsPerRound = 100;
 constexpr int kPipelined = 10000;
 
-/** A floor server in a process of its own, and the client that calls it. */
-class FloorPeer {
-public:
-    FloorPeer(uint16_t servicePort, uint16_t clientPort, Hop hop)
-        : mServer(ChildProcess::call([=] { serveFloor(servicePort, clientPort, hop); })),
-          mClient(servicePort, clientPort) {
-        mReady = mClient.awaitConnectionBack(nullptr);
-    }
-
-    [[nodiscard]] bool ready() const { return mReady; }
-    [[nodiscard]] RpcClient& client() { return mClient; }
-
-private:
-    ChildProcess mServer;
-    RpcClient mClient;
-    bool mReady = false;
-};
-
 struct Contender {
     std::string name;
+    Role role;
     std::function<void()> call;
     std::function<double()> pipeline; ///< requests a second; empty where there is none
 };
@@ -54,14 +39,14 @@ double microsecondsOf(const std::function<void()>& call) {
     return std::chrono::duration<double, std::micro>(Clock::now() - start).count();
 }
 
-Contender packetContender(std::string name, RpcClient& client, const Packet& request) {
+Contender packetContender(std::string name, Role role, RpcClient& client, const Packet& request) {
     auto reply = std::make_shared<Packet>();
-    return {std::move(name),
+    return {std::move(name), role,
             [&client, &request, reply] {
                 client.send(request);
                 client.receive(*reply);
             },
-            [&client, &request] { return client.pipeline(request, kPipelined); }};
+            [&client, &request] { return client.pipeline(request, kPipelined, kPipelined); }};
 }
 
 /** `calls` calls of each contender in turn, `rounds` times, with a pause before each call. */
@@ -80,7 +65,8 @@ Row measureCalls(const std::string& name, const std::vector<Contender>& contende
     }
     Row row{name, "us", {}, Better::kLower};
     for (std::size_t i = 0; i < contenders.size(); ++i)
-        row.entries.push_back({contenders[i].name, summarize(std::move(samples[i]))});
+        row.entries.push_back(
+            {contenders[i].name, summarize(std::move(samples[i])), contenders[i].role});
     return row;
 }
 
@@ -88,7 +74,7 @@ Row measurePipelines(const std::vector<Contender>& contenders, int rounds) {
     Row row{"pipelined", "requests/s", {}, Better::kHigher};
     for (const Contender& contender : contenders)
         if (contender.pipeline)
-            row.entries.push_back({contender.name, {}});
+            row.entries.push_back({contender.name, {}, contender.role});
     std::vector<std::vector<double>> samples(row.entries.size());
     for (int round = 0; round < rounds; ++round) {
         std::size_t i = 0;
@@ -107,52 +93,59 @@ int64_t monotonicNanoseconds() {
 }
 
 /** With a file open a status request goes on to the main thread, which calls the engine. */
-void measureWayToEngine(DaemonPeer& daemon, int rounds, Report& report) {
+void measureWayToEngine(DaemonClient& client, int calls, Report& report) {
     std::vector<double> toEngine;
     std::vector<double> andBack;
     Packet reply;
-    for (int call = 0; call < rounds * kCallsPerRound; ++call) {
+    for (int call = 0; call < calls; ++call) {
         const int64_t start = monotonicNanoseconds();
-        daemon.client().send(daemon.statusRequest());
-        daemon.client().receive(reply);
+        client.rpc().send(client.statusRequest());
+        client.rpc().receive(reply);
         andBack.push_back(static_cast<double>(monotonicNanoseconds() - start) / 1000.0);
-        toEngine.push_back(static_cast<double>(DaemonPeer::engineCallTime(reply) - start) / 1000.0);
+        toEngine.push_back(static_cast<double>(DaemonClient::engineCallTime(reply) - start) /
+                           1000.0);
     }
-    report.add({"request to engine call", "us", {{"daemon", summarize(std::move(toEngine))}}});
-    report.add({"the same and back", "us", {{"daemon", summarize(std::move(andBack))}}});
+    report.add(Row{"request to engine call", "us", {{"daemon", summarize(std::move(toEngine))}}});
+    report.add(Row{"the same and back", "us", {{"daemon", summarize(std::move(andBack))}}});
+}
+
+void measureAll(const std::vector<Contender>& contenders, int rounds, Report& report) {
+    report.add(measureCalls("request to reply", contenders, rounds, kCallsPerRound, {}));
+    report.add(measureCalls("request to reply, 2 ms between", contenders, rounds,
+                            kSpacedCallsPerRound, milliseconds(2)));
+    report.add(measurePipelines(contenders, rounds));
 }
 
 } // namespace
 
 int runRpc(const Options& options, Report& report) {
-    if (!enterOwnNetwork())
-        std::fputs("qnsmedia-bench: no network of its own; using the machine's ports\n", stderr);
-    const int rounds = options.rounds > 0 ? options.rounds : kDefaultRounds;
-
+    isolateNetwork();
     // Processes first: a fork is safe only while there is one thread.
     FloorPeer raw(2008, 2000, Hop::none);
     FloorPeer hop(2018, 2010, Hop::semaphore);
-    DbusPeer dbus;
+    std::optional<DbusPeer> dbus;
+    if (takesPart("D-Bus", "dbus-daemon", report))
+        dbus.emplace();
     DaemonPeer daemon;
-    if (!raw.ready() || !hop.ready() || !dbus.ready() || !daemon.ready()) {
+    if (!raw.ready() || !hop.ready() || (dbus && !dbus->ready()) || !daemon.ready()) {
         std::fputs("qnsmedia-bench: a contender could not be started\n", stderr);
         return 1;
     }
 
-    const Packet& request = daemon.statusRequest();
-    const std::vector<Contender> contenders = {
-        packetContender("daemon", daemon.client(), request),
-        packetContender("raw sockets", raw.client(), request),
-        packetContender("raw sockets and a thread hop", hop.client(), request),
-        {"D-Bus", [&dbus] { dbus.call(); }, {}},
+    DaemonClient& client = daemon.client();
+    const Packet& request = client.statusRequest();
+    std::vector<Contender> contenders = {
+        packetContender("daemon", Role::ours, client.rpc(), request),
+        packetContender("bare sockets", Role::floor, raw.client(), request),
+        packetContender("bare sockets, thread hop", Role::floor, hop.client(), request),
     };
-    report.add(measureCalls("request to reply", contenders, rounds, kCallsPerRound, {}));
-    report.add(measureCalls("request to reply, 2 ms between", contenders, rounds,
-                            kSpacedCallsPerRound, milliseconds(2)));
-    report.add(measurePipelines(contenders, rounds));
-    if (!daemon.openFile())
+    if (dbus)
+        contenders.push_back({"D-Bus", Role::peer, [&dbus] { dbus->connection().call(); }, {}});
+    const int rounds = roundsOf(options, kDefaultRounds, 1);
+    measureAll(contenders, rounds, report);
+    if (!client.openFile())
         return 1;
-    measureWayToEngine(daemon, rounds, report);
+    measureWayToEngine(client, rounds * kCallsPerRound, report);
     return 0;
 }
 

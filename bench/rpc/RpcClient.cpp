@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include "bench/rpc/RpcClient.h"
 
+#include <boost/interprocess/sync/interprocess_semaphore.hpp>
 #include <chrono>
 #include <thread>
 
@@ -26,15 +27,20 @@ bool RpcClient::receive(Packet& reply) {
     return readPacket(mReplies.get(), reply);
 }
 
-double RpcClient::pipeline(const Packet& request, int count) {
+double RpcClient::pipeline(const Packet& request, int count, int inFlight) {
+    boost::interprocess::interprocess_semaphore mayGo(static_cast<unsigned>(inFlight));
     const auto start = std::chrono::steady_clock::now();
     std::thread reader([&] {
         Packet reply;
-        for (int i = 0; i < count; ++i)
+        for (int i = 0; i < count; ++i) {
             receive(reply);
+            mayGo.post();
+        }
     });
-    for (int i = 0; i < count; ++i)
+    for (int i = 0; i < count; ++i) {
+        mayGo.wait();
         send(request);
+    }
     reader.join();
     const std::chrono::duration<double> elapsed = std::chrono::steady_clock::now() - start;
     return count / elapsed.count();

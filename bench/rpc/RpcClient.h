@@ -20,8 +20,11 @@ public:
     bool send(const Packet& request);
     bool receive(Packet& reply);
 
-    /** Sends `count` requests without waiting while replies are read; requests a second. */
-    double pipeline(const Packet& request, int count);
+    /**
+     * Sends `count` requests while replies are read, up to `inFlight` of them unanswered;
+     * requests a second.
+     */
+    double pipeline(const Packet& request, int count, int inFlight);
 
 private:
     qns::UniqueFd mListener;

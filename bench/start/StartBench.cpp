@@ -2,7 +2,6 @@
 // How soon the daemon serves, and what it needs while nobody asks: beside an empty QApplication,
 // which is the least it can be, and beside another media daemon.
 #include <chrono>
-#include <cstdio>
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
@@ -11,8 +10,8 @@
 
 #include "bench/Benches.h"
 #include "bench/ChildProcess.h"
+#include "bench/Programs.h"
 #include "bench/Report.h"
-#include "bench/rpc/DaemonPeer.h"
 #include "bench/rpc/PacketSocket.h"
 #include "bench/start/ProcessUse.h"
 
@@ -22,11 +21,14 @@ namespace {
 using Clock = std::chrono::steady_clock;
 
 constexpr int kDefaultRounds = 10;
+constexpr int kQuickRounds = 3;
 constexpr std::chrono::seconds kSettle{2};
 constexpr std::chrono::seconds kIdle{30};
+constexpr std::chrono::seconds kQuickIdle{5};
 
 struct Contender {
     std::string name;
+    Role role;
     std::vector<std::string> command;
     uint16_t port;
 };
@@ -36,10 +38,6 @@ double millisecondsToServe(const Contender& contender) {
     const ChildProcess process = ChildProcess::run(contender.command);
     const qns::UniqueFd connection = connectTo(contender.port);
     return std::chrono::duration<double, std::milli>(Clock::now() - start).count();
-}
-
-Statistics once(double value) {
-    return summarize({value});
 }
 
 std::string writeMpdConfiguration(const std::filesystem::path& folder) {
@@ -52,37 +50,35 @@ std::string writeMpdConfiguration(const std::filesystem::path& folder) {
     return (folder / "mpd.conf").string();
 }
 
-} // namespace
-
-int runStart(const Options& options, Report& report) {
-    if (!enterOwnNetwork())
-        std::fputs("qnsmedia-bench: no network of its own; using the machine's ports\n", stderr);
-    const int rounds = options.rounds > 0 ? options.rounds : kDefaultRounds;
-    const std::filesystem::path folder =
-        std::filesystem::temp_directory_path() / ("qnsmedia-bench-" + std::to_string(::getpid()));
-    const std::string mpdConfiguration = writeMpdConfiguration(folder);
-    ::setenv("QT_QPA_PLATFORM", "offscreen", 0);
-
-    const std::vector<Contender> contenders = {
-        {"daemon", {programFolder() + "/QNSMediaService"}, 1008},
-        {"empty QApplication", {programFolder() + "/bench-empty-application"}, 1009},
-        {"MPD", {"mpd", "--no-daemon", mpdConfiguration}, 6600},
+std::vector<Contender> contendersIn(const std::filesystem::path& folder, Report& report) {
+    std::vector<Contender> contenders = {
+        {"daemon", Role::ours, {programFolder() + "/QNSMediaService"}, 1008},
+        {"empty QApplication", Role::floor, {programFolder() + "/bench-empty-application"}, 1009},
     };
+    if (takesPart("MPD", "mpd", report))
+        contenders.push_back(
+            {"MPD", Role::peer, {"mpd", "--no-daemon", writeMpdConfiguration(folder)}, 6600});
+    return contenders;
+}
 
-    Row start{"exec to first accepted connection", "ms", {}};
-    Row memory{"resident when idle", "MB", {}};
-    Row cpu{"processor time in 30 idle seconds", "s", {}};
-    Row wakeUps{"context switches in 30 idle seconds", "", {}};
-    for (const Contender& contender : contenders)
-        start.entries.push_back({contender.name, {}});
-
+Row measureStart(const std::vector<Contender>& contenders, int rounds) {
     std::vector<std::vector<double>> samples(contenders.size());
     for (int round = 0; round < rounds; ++round)
         for (std::size_t i = 0; i < contenders.size(); ++i)
             samples[i].push_back(millisecondsToServe(contenders[i]));
+    Row row{"exec to first accepted connection", "ms", {}};
     for (std::size_t i = 0; i < contenders.size(); ++i)
-        start.entries[i].figures = summarize(std::move(samples[i]));
+        row.entries.push_back(
+            {contenders[i].name, summarize(std::move(samples[i])), contenders[i].role});
+    return row;
+}
 
+/** All contenders side by side, for so many seconds without anything to do. */
+void measureIdle(const std::vector<Contender>& contenders, std::chrono::seconds idle,
+                 Report& report) {
+    Row memory{"resident when idle", "MB", {}};
+    Row load{"processor when idle", "%", {}};
+    Row wakeUps{"context switches a second when idle", "1/s", {}};
     std::vector<ChildProcess> processes;
     for (const Contender& contender : contenders) {
         processes.push_back(ChildProcess::run(contender.command));
@@ -92,17 +88,32 @@ int runStart(const Options& options, Report& report) {
     std::vector<ProcessUse> before;
     for (const ChildProcess& process : processes)
         before.push_back(readProcessUse(process.pid()));
-    std::this_thread::sleep_for(kIdle);
+    std::this_thread::sleep_for(idle);
+    const auto seconds = static_cast<double>(idle.count());
     for (std::size_t i = 0; i < contenders.size(); ++i) {
         const ProcessUse after = readProcessUse(processes[i].pid());
-        const std::string& name = contenders[i].name;
-        memory.entries.push_back({name, once(after.residentMegabytes)});
-        cpu.entries.push_back({name, once(after.cpuSeconds - before[i].cpuSeconds)});
-        wakeUps.entries.push_back(
-            {name, once(static_cast<double>(after.contextSwitches - before[i].contextSwitches))});
+        const auto add = [&](Row& row, double figure) {
+            row.entries.push_back({contenders[i].name, summarize({figure}), contenders[i].role});
+        };
+        add(memory, after.residentMegabytes);
+        add(load, 100 * (after.cpuSeconds - before[i].cpuSeconds) / seconds);
+        add(wakeUps,
+            static_cast<double>(after.contextSwitches - before[i].contextSwitches) / seconds);
     }
-    for (Row* row : {&start, &memory, &cpu, &wakeUps})
+    for (Row* row : {&memory, &load, &wakeUps})
         report.add(std::move(*row));
+}
+
+} // namespace
+
+int runStart(const Options& options, Report& report) {
+    isolateNetwork();
+    const std::filesystem::path folder =
+        std::filesystem::temp_directory_path() / ("qnsmedia-bench-" + std::to_string(::getpid()));
+    ::setenv("QT_QPA_PLATFORM", "offscreen", 0);
+    const std::vector<Contender> contenders = contendersIn(folder, report);
+    report.add(measureStart(contenders, roundsOf(options, kDefaultRounds, kQuickRounds)));
+    measureIdle(contenders, options.quick ? kQuickIdle : kIdle, report);
     std::filesystem::remove_all(folder);
     return 0;
 }

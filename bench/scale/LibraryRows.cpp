@@ -1,14 +1,15 @@
 // SPDX-License-Identifier: MIT
-#include "bench/import/LibraryRows.h"
-
+// A library without files and daemon: what a row costs while it grows, and searching in it.
 #include <algorithm>
 #include <chrono>
 #include <filesystem>
 #include <functional>
-#include <stdexcept>
 #include <string>
 #include <unistd.h>
 
+#include "bench/Benches.h"
+#include "bench/scale/CurveBuilder.h"
+#include "bench/scale/Scales.h"
 #include "library/Database.h"
 
 namespace bench {
@@ -17,7 +18,8 @@ namespace {
 namespace fs = std::filesystem;
 using Clock = std::chrono::steady_clock;
 
-constexpr int kLargest = 100'000;
+constexpr int kDefaultRounds = 3;
+constexpr int kGrowthRounds = 3;
 constexpr int kBatch = 128; // as many as the importer commits together
 
 double milliseconds(const std::function<void()>& work) {
@@ -86,67 +88,71 @@ private:
     int mSize = 0;
 };
 
-Row measureGrowth(GrowingLibrary& library, int rounds) {
-    Row row{"a row, with so many there", "ms", {}};
-    for (const int size : {1'000, 3'000, 10'000, 30'000, kLargest}) {
-        library.growTo(size - rounds * 2 * kBatch);
-        std::vector<double> samples;
-        for (int left = rounds - 1; left >= 0; --left)
-            samples.push_back(library.growTo(size - left * 2 * kBatch));
-        row.entries.push_back({std::to_string(size), summarize(std::move(samples))});
-    }
-    return row;
-}
+struct Search {
+    const char* name;
+    const char* words;
+    const char* order;
+};
 
-void countRows(const SQLite::Database& database, const std::string& query) {
+constexpr Search kSearches[] = {
+    {"a word", "latdon", "ORDER BY rank"},  {"two words", "latdon gen*", "ORDER BY rank"},
+    {"3 letters", "lat*", "ORDER BY rank"}, {"2 letters", "la*", "ORDER BY rank"},
+    {"2 letters, any", "la*", ""},
+};
+
+int countRows(const SQLite::Database& database, const std::string& query) {
     SQLite::Statement rows(database, query);
     int count = 0;
     while (rows.executeStep())
         ++count;
-    if (count == 0)
-        throw std::runtime_error("nothing is found: " + query);
+    return count;
 }
 
-Row measureSearch(const fs::path& file, int rounds) {
-    struct Search {
-        const char* name;
-        const char* words;
-        const char* order;
-    };
-    constexpr Search kSearches[] = {
-        {"a word", "latdon", "ORDER BY rank"},
-        {"two words", "latdon gen*", "ORDER BY rank"},
-        {"3 letters", "lat*", "ORDER BY rank"},
-        {"2 letters", "la*", "ORDER BY rank"},
-        {"2, unranked", "la*", ""},
-    };
+/** Appends what the search takes, so many times. */
+void measureSearch(const Search& search, const fs::path& file, int times,
+                   std::vector<double>& samples) {
     const SQLite::Database database(file.string());
-    Row row{"search in 100,000, best 50", "ms", {}};
-    for (const Search& search : kSearches) {
-        const std::string query = std::string("SELECT media.id, media.title FROM media_search('") +
-                                  search.words + "') JOIN media ON media.id = media_search.rowid " +
-                                  search.order + " LIMIT 50";
-        std::vector<double> samples;
-        for (int round = 0; round < rounds * 10; ++round)
-            samples.push_back(milliseconds([&] { countRows(database, query); }));
-        row.entries.push_back({search.name, summarize(std::move(samples))});
+    const std::string query = std::string("SELECT media.id, media.title FROM media_search('") +
+                              search.words + "') JOIN media ON media.id = media_search.rowid " +
+                              search.order + " LIMIT 50";
+    for (int i = 0; i < times; ++i)
+        samples.push_back(milliseconds([&] { countRows(database, query); }));
+}
+
+void measureGrowth(GrowingLibrary& library, int size, std::vector<double>& samples) {
+    library.growTo(size - kGrowthRounds * 2 * kBatch);
+    for (int left = kGrowthRounds - 1; left >= 0; --left)
+        samples.push_back(library.growTo(size - left * 2 * kBatch));
+}
+
+void measureAll(const fs::path& file, const std::vector<int>& sizes, int rounds, Report& report) {
+    GrowingLibrary library(file);
+    CurveBuilder growth({"a row put into the library", "ms", "rows", sizes, {}});
+    CurveBuilder searches({"search, best 50", "ms", "rows", sizes, {}});
+    growth.addLine("library", Role::ours);
+    for (const Search& search : kSearches)
+        searches.addLine(search.name, Role::ours);
+    for (std::size_t place = 0; place < sizes.size(); ++place) {
+        measureGrowth(library, sizes[place], growth.samples(0, place));
+        for (std::size_t i = 0; i < std::size(kSearches); ++i)
+            measureSearch(kSearches[i], file, rounds * 10, searches.samples(i, place));
     }
-    return row;
+    report.add(growth.finish());
+    report.add(searches.finish());
 }
 
 } // namespace
 
-void measureLibraryRows(int rounds, Report& report) {
+bool measureLibraryRows(const Options& options, Report& report) {
     const fs::path folder =
         fs::temp_directory_path() / ("qnsmedia-bench-rows-" + std::to_string(::getpid()));
     fs::create_directories(folder);
-    const fs::path file = folder / "media.db";
-    {
-        GrowingLibrary library(file);
-        report.add(measureGrowth(library, std::min(rounds, 3)));
-    }
-    report.add(measureSearch(file, rounds));
+    std::vector<int> sizes = {1'000, 3'000, 10'000};
+    if (!options.quick)
+        sizes.insert(sizes.end(), {30'000, 100'000});
+    measureAll(folder / "media.db", sizes, roundsOf(options, kDefaultRounds, 1), report);
     fs::remove_all(folder);
+    return true;
 }
 
 } // namespace bench
