@@ -16,10 +16,10 @@ namespace {
 
 Json figuresToJson(const Statistics& figures) {
     return {{"samples", figures.samples},
-            {"median", figures.median},
-            {"p99", figures.p99},
-            {"min", figures.minimum},
-            {"max", figures.maximum}};
+            {"median", rounded(figures.median)},
+            {"p99", rounded(figures.p99)},
+            {"min", rounded(figures.minimum)},
+            {"max", rounded(figures.maximum)}};
 }
 
 Statistics figuresFromJson(const Json& json) {
@@ -39,7 +39,7 @@ Json rowToJson(const Row& row) {
         Json object{{"who", entry.who}, {"role", isFirst ? Role::ours : entry.role}};
         object.update(figuresToJson(entry.figures));
         if (!isFirst)
-            object["ratio"] = ratio(row, entry);
+            object["ratio"] = rounded(ratio(row, entry));
         entries.push_back(std::move(object));
     }
     return {{"name", row.name}, {"unit", row.unit}, {"better", row.better}, {"entries", entries}};

@@ -4,6 +4,8 @@
 #include <algorithm>
 #include <cmath>
 #include <cstddef>
+#include <cstdio>
+#include <cstdlib>
 
 namespace bench {
 
@@ -20,6 +22,12 @@ Statistics summarize(std::vector<double> samples) {
     std::sort(samples.begin(), samples.end());
     return {percentile(samples, 0.5), percentile(samples, 0.99), samples.front(), samples.back(),
             static_cast<int>(samples.size())};
+}
+
+double rounded(double figure) {
+    char text[32];
+    std::snprintf(text, sizeof text, "%.5g", figure);
+    return std::strtod(text, nullptr);
 }
 
 } // namespace bench

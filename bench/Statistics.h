@@ -19,4 +19,7 @@ struct Statistics {
 /** The sample below which `part` (0 to 1) of the sorted samples lie; 0 without samples. */
 [[nodiscard]] double percentile(const std::vector<double>& sorted, double part);
 
+/** With five digits: more would be chance, and make files larger. */
+[[nodiscard]] double rounded(double figure);
+
 } // namespace bench

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include "bench/Benches.h"
 #include "bench/Report.h"
+#include "bench/all/AllBench.h"
 
 #include <CLI/CLI.hpp>
 #include <cstdio>
@@ -13,18 +14,20 @@ struct Bench {
     const char* name;
     const char* summary;
     int (*run)(const bench::Options& options, bench::Report& report);
+    bool isPinned; ///< on one core in a run of all
 };
 
 constexpr Bench kBenches[] = {
-    {"rpc", "one request and its answer, beside bare sockets and D-Bus", bench::runRpc},
-    {"pack", "encode and decode every value form, beside msgpack-c", bench::runPack},
-    {"player", "open, seek, close and loop real files, beside libmpv", bench::runPlayer},
+    {"rpc", "one request and its answer, beside bare sockets and D-Bus", bench::runRpc, true},
+    {"pack", "encode and decode every value form, beside msgpack-c", bench::runPack, true},
+    {"player", "open, seek, close and loop real files, beside libmpv", bench::runPlayer, true},
     {"start", "start-up, memory and idle load, beside an empty QApplication and MPD",
-     bench::runStart},
-    {"media", "read and draw files, beside the libraries and commands that do", bench::runMedia},
-    {"import", "import thousands of files, beside MPD and minidlna", bench::runImport},
+     bench::runStart, true},
+    {"media", "read and draw files, beside the libraries and commands that do", bench::runMedia,
+     true},
+    {"import", "import thousands of files, beside MPD and minidlna", bench::runImport, false},
     {"scale", "how costs grow with clients, requests, listeners, discoverers and rows",
-     bench::runScale},
+     bench::runScale, false},
 };
 
 struct CommonOptions {
@@ -65,6 +68,13 @@ void addCommonOptions(CLI::App& command, CommonOptions& options) {
     command.allow_extras();
 }
 
+int runAll(const CommonOptions& options) {
+    std::vector<bench::Subcommand> subcommands;
+    for (const Bench& bench : kBenches)
+        subcommands.push_back({bench.name, bench.isPinned});
+    return bench::runAll(subcommands, options.bench, options.json, options.core);
+}
+
 } // namespace
 
 int main(int argc, char** argv) {
@@ -73,8 +83,12 @@ int main(int argc, char** argv) {
     CommonOptions options;
     for (const Bench& bench : kBenches)
         addCommonOptions(*app.add_subcommand(bench.name, bench.summary), options);
+    CLI::App* const all = app.add_subcommand("all", "all of these, and one table");
+    addCommonOptions(*all, options);
     CLI11_PARSE(app, argc, argv);
 
+    if (all->parsed())
+        return runAll(options);
     for (const Bench& bench : kBenches) {
         const CLI::App& command = *app.get_subcommand(bench.name);
         if (!command.parsed())
