@@ -114,10 +114,13 @@ TEST_F(Worker, AFileThatHasTakenItOverReachesNothing) {
 
 #endif
 
-TEST_F(Worker, WhatItSaysIsNotBelievedWhenItCannotBe) {
-    EXPECT_EQ(describe(hostile("lie")), kInternal);
-    EXPECT_EQ(describe(hostile("babble")), kInternal);
-    EXPECT_EQ(describe(samplePath("film.mp4")), kOk);
+TEST_F(Worker, OneThatSaysWhatCannotBeIsNotBelievedNorAskedAgain) {
+    for (const char* const order : {"lie", "babble"}) {
+        const pid_t liar = idleWorker(mPool);
+        EXPECT_EQ(describe(hostile(order)), kInternal) << order;
+        EXPECT_TRUE(isGone(liar)) << order;
+        EXPECT_EQ(describe(samplePath("film.mp4")), kOk) << order;
+    }
 }
 
 TEST_F(Worker, OneThatWasKilledWhileItWaitedIsReplacedUnnoticed) {

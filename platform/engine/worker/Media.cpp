@@ -47,16 +47,15 @@ bool isPossible(const discoverer::Details& details) {
 
 template<typename Reply>
 int ask(Pool& pool, const Pool::Question& question, Reply& reply) {
-    const auto answer = pool.ask(question);
-    if (const int* const result = std::get_if<int>(&answer))
-        return *result;
-    MessageReader message(std::get<std::string>(answer));
     int result = kInternal;
-    message(result);
-    if (result == kOk)
-        message(reply);
-    return message.isGood() && isResult(result) && isPossible(reply) ? result
-                                                                     : static_cast<int>(kInternal);
+    const int outcome = pool.ask(question, [&](std::string_view bytes) {
+        MessageReader message(bytes);
+        message(result);
+        if (result == kOk)
+            message(reply);
+        return message.isGood() && isResult(result) && isPossible(reply);
+    });
+    return outcome == kOk ? result : outcome;
 }
 
 } // namespace

@@ -23,6 +23,26 @@ namespace {
 
 constexpr std::size_t kMostIdle = 2;
 
+/** What a question comes to whose worker is lost. */
+struct Loss {
+    int result;
+    const char* event; ///< null: how the process ended
+};
+
+Loss lossOf(Process::Outcome outcome) {
+    switch (outcome) {
+    case Process::Outcome::kNotStarted:
+        return {kNotAvailable, nullptr};
+    case Process::Outcome::kTimedOut:
+        return {kTimedOut, "took too long"};
+    case Process::Outcome::kAnswered:
+        return {kInternal, "said what cannot be"};
+    case Process::Outcome::kEnded:
+        break;
+    }
+    return {kDamaged, nullptr};
+}
+
 /** The folder of the library, or program, that this code is in. */
 std::string ownFolder() {
     static const char mark = 0;
@@ -53,17 +73,17 @@ void Pool::warm() {
     giveBack(take());
 }
 
-std::variant<std::string, int> Pool::ask(const Question& question) {
+int Pool::ask(const Question& question, const Listener& listen) {
     auto process = take();
     if (!process)
         return kNotAvailable;
-    Process::Answer answer = askBusy(*process, question);
+    const Process::Answer answer = askBusy(*process, question);
     if (isCancelled())
         return kCancelled;
-    if (answer.outcome != Process::Outcome::kAnswered)
+    if (answer.outcome != Process::Outcome::kAnswered || !listen(answer.bytes))
         return lose(std::move(process), answer.outcome, question.name);
     giveBack(std::move(process));
-    return std::move(answer.bytes);
+    return kOk;
 }
 
 Process::Answer Pool::askBusy(Process& process, const Question& question) {
@@ -127,14 +147,13 @@ void Pool::giveBack(std::unique_ptr<Process> process) {
 
 int Pool::lose(std::unique_ptr<Process> process, Process::Outcome outcome,
                const std::string& name) {
-    const bool isLate = outcome == Process::Outcome::kTimedOut;
-    const std::string end = isLate ? "took too long" : process->end();
-    qnsys_syslog(LOG_WARNING, "Media worker %s, reading %s", end.c_str(), name.c_str());
-    process.reset();
-    if (outcome == Process::Outcome::kNotStarted)
-        return kNotAvailable;
-    giveBack(start());
-    return isLate ? kTimedOut : kDamaged;
+    const std::string end = process->end();
+    const Loss loss = lossOf(outcome);
+    qnsys_syslog(LOG_WARNING, "Media worker %s, reading %s", loss.event ? loss.event : end.c_str(),
+                 name.c_str());
+    if (outcome != Process::Outcome::kNotStarted)
+        giveBack(start());
+    return loss.result;
 }
 
 } // namespace worker

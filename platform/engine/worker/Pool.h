@@ -1,11 +1,12 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <functional>
 #include <memory>
 #include <mutex>
 #include <string>
+#include <string_view>
 #include <utility>
-#include <variant>
 #include <vector>
 
 #include "worker/Process.h"
@@ -45,8 +46,12 @@ public:
         std::string name; ///< of the file, for the log
     };
 
-    /** The answer's bytes, or a LibMediaPlayer::Result when there is none. Ends in time. */
-    std::variant<std::string, int> ask(const Question& question);
+    /** Takes an answer's bytes; false when no worker in its right mind says that. */
+    using Listener = std::function<bool(std::string_view bytes)>;
+
+    /** Returns 0 once the listener has taken the answer, or a LibMediaPlayer::Result. Ends in time.
+     */
+    int ask(const Question& question, const Listener& listen);
 
     /** From now on every question, also those that wait, is answered by kCancelled. */
     void cancel();
@@ -58,7 +63,6 @@ private:
     Process::Answer askBusy(Process& process, const Question& question);
     void giveBack(std::unique_ptr<Process> process);
     int lose(std::unique_ptr<Process> process, Process::Outcome outcome, const std::string& name);
-
     [[nodiscard]] bool isCancelled();
 
     const std::string mProgram;
