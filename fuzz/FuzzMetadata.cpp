@@ -15,13 +15,13 @@
 
 #include "LibMediaPlayer/Result.h"
 #include "base/UniqueFd.h"
-#include "discoverer/Description.h"
-#include "discoverer/MediaTypes.h"
-#include "discoverer/TagText.h"
 #include "fuzz/support/Input.h"
 #include "fuzz/support/MetadataCheck.h"
 #include "fuzz/support/Require.h"
 #include "probe/MediaFile.h"
+#include "reader/Description.h"
+#include "reader/MediaTypes.h"
+#include "reader/TagText.h"
 #include "text/Text.h"
 
 namespace {
@@ -131,7 +131,7 @@ void requireTagsOf(Input& input) {
         probe::FormatContext context(probe::kAdopt, avformat_alloc_context());
         context->iformat = av_find_input_format(format);
         fillContext(again, *context.get());
-        fuzz::requireTags(discoverer::tagText(*context.get()));
+        fuzz::requireTags(reader::tagText(*context.get()));
         context->iformat = nullptr;
     }
 }
@@ -155,6 +155,6 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
     requireTagsOf(input);
     const auto pFile = openSound();
     fillContext(input, pFile->context());
-    fuzz::requireSound(discoverer::readDetails(*pFile).info);
+    fuzz::requireSound(reader::readDetails(*pFile).info);
     return 0;
 }

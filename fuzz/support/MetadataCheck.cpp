@@ -9,13 +9,13 @@
 #include "define/ObjectIds.h"
 #include "discoverer/MediaDiscovererController.h"
 #include "discoverer/MediaDiscovererServiceCallBackRemoteProxy.h"
-#include "discoverer/TagText.h"
 #include "fuzz/support/Engine.h"
 #include "fuzz/support/Packets.h"
 #include "fuzz/support/Require.h"
 #include "ptc/Event.h"
 #include "ptc/EventPacket.h"
 #include "ptc/ISender.h"
+#include "reader/TagText.h"
 
 using namespace LibMediaPlayer;
 
@@ -97,7 +97,7 @@ private:
 } // namespace
 
 void requireTags(const std::wstring& tags) {
-    require(qns::narrow(tags).size() <= discoverer::kTagBytes);
+    require(qns::narrow(tags).size() <= reader::kTagBytes);
     std::wstring_view left = tags;
     while (!left.empty()) {
         const std::wstring_view line = left.substr(0, left.find(L'\n'));

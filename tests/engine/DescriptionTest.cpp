@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include "discoverer/Description.h"
+#include "reader/Description.h"
 
 #include <memory>
 #include <string>
@@ -9,7 +9,7 @@
 
 #include <gtest/gtest.h>
 
-#include "discoverer/OpenMedia.h"
+#include "reader/OpenMedia.h"
 #include "tests/engine/Matroska.h"
 
 namespace {
@@ -21,8 +21,8 @@ LibMediaPlayer::MediaMetaInfo described(const std::string& content) {
     probe::RegularFile file;
     EXPECT_EQ(file.adopt(std::move(memory)), 0);
     std::unique_ptr<probe::MediaFile> pFile;
-    EXPECT_EQ(discoverer::openMedia(std::move(file), probe::MediaFile::kLook, pFile), 0);
-    return pFile ? discoverer::readDetails(*pFile).info : LibMediaPlayer::MediaMetaInfo{};
+    EXPECT_EQ(reader::openMedia(std::move(file), probe::MediaFile::kLook, pFile), 0);
+    return pFile ? reader::readDetails(*pFile).info : LibMediaPlayer::MediaMetaInfo{};
 }
 
 constexpr std::uint32_t kNonsense = 0xfffffff0; // negative where it is kept as an int

@@ -1,11 +1,11 @@
 // SPDX-License-Identifier: MIT
-#include "discoverer/Scaler.h"
+#include "reader/Scaler.h"
 
 #include <gtest/gtest.h>
 
 #include <algorithm>
 
-#include "discoverer/ImageEncoder.h"
+#include "reader/ImageEncoder.h"
 
 namespace {
 
@@ -36,7 +36,7 @@ TEST(Scaler, EveryPixelOfEveryWidthIsDrawn) {
         const auto frame = whiteFrame(width, 6);
         for (const int height : {6, 3}) {
             std::vector<std::uint32_t> pixels;
-            ASSERT_TRUE(discoverer::scaleToPixels(*frame.get(), {width, height}, pixels));
+            ASSERT_TRUE(reader::scaleToPixels(*frame.get(), {width, height}, pixels));
             EXPECT_EQ(pixels.size(), static_cast<std::size_t>(width * height));
             EXPECT_TRUE(std::all_of(pixels.begin(), pixels.end(), isAlmostWhite)) << width;
         }
@@ -46,10 +46,10 @@ TEST(Scaler, EveryPixelOfEveryWidthIsDrawn) {
 TEST(ImageEncoder, TakesPicturesOfEveryWidth) {
     av_log_set_level(AV_LOG_QUIET);
     for (int width = 1; width <= 100; ++width) {
-        discoverer::Canvas canvas{{width, 3}, {}};
-        canvas.pixels.reserve(static_cast<std::size_t>(width) * 3 + discoverer::kReadAhead);
+        reader::Canvas canvas{{width, 3}, {}};
+        canvas.pixels.reserve(static_cast<std::size_t>(width) * 3 + reader::kReadAhead);
         canvas.pixels.assign(static_cast<std::size_t>(width) * 3, kWhite);
-        for (const auto& encoding : {discoverer::kPng, discoverer::kJpeg, discoverer::kSmallJpeg})
-            EXPECT_TRUE(discoverer::encode(canvas, encoding)) << width;
+        for (const auto& encoding : {reader::kPng, reader::kJpeg, reader::kSmallJpeg})
+            EXPECT_TRUE(reader::encode(canvas, encoding)) << width;
     }
 }

@@ -5,11 +5,11 @@
 #include <variant>
 
 #include "LibMediaPlayer/Result.h"
-#include "discoverer/Description.h"
-#include "discoverer/DrawThumbnail.h"
-#include "discoverer/Image.h"
-#include "discoverer/OpenMedia.h"
 #include "probe/MediaFile.h"
+#include "reader/Description.h"
+#include "reader/DrawThumbnail.h"
+#include "reader/Image.h"
+#include "reader/OpenMedia.h"
 #include "worker/Message.h"
 
 namespace worker {
@@ -56,17 +56,17 @@ std::string describe(Files& files) {
     std::unique_ptr<probe::MediaFile> pMedia;
     int result = takeMedia(files, file);
     if (result == kOk)
-        result = discoverer::openMedia(std::move(file), probe::MediaFile::kLook, pMedia);
-    return result == kOk ? message(result, discoverer::readDetails(*pMedia)) : message(result);
+        result = reader::openMedia(std::move(file), probe::MediaFile::kLook, pMedia);
+    return result == kOk ? message(result, reader::readDetails(*pMedia)) : message(result);
 }
 
 std::string draw(const Drawing& drawing, Files& files) {
     probe::RegularFile file;
     int result = files.size() == kMostFiles ? takeMedia(files, file) : static_cast<int>(kInternal);
     if (result == kOk)
-        result = discoverer::drawImage(std::move(file), std::chrono::nanoseconds(drawing.position),
-                                       {drawing.width, drawing.height}, drawing.form,
-                                       files.back().get());
+        result =
+            reader::drawImage(std::move(file), std::chrono::nanoseconds(drawing.position),
+                              {drawing.width, drawing.height}, drawing.form, files.back().get());
     return message(result);
 }
 
@@ -74,7 +74,7 @@ std::string drawThumbnail(Files& files) {
     probe::RegularFile file;
     if (const int result = takeMedia(files, file); result != kOk)
         return message(result);
-    discoverer::Thumbnail thumbnail = discoverer::drawThumbnail(std::move(file));
+    discoverer::Thumbnail thumbnail = reader::drawThumbnail(std::move(file));
     return message(thumbnail.result, thumbnail);
 }
 

@@ -1,11 +1,11 @@
 // SPDX-License-Identifier: MIT
-#include "discoverer/MediaTypes.h"
+#include "reader/MediaTypes.h"
 
 #include <algorithm>
 #include <iterator>
 #include <string_view>
 
-namespace discoverer {
+namespace reader {
 
 namespace {
 
@@ -128,4 +128,4 @@ std::string codecType(const AVCodecParameters& stream) {
     return name.substr(0, 4) == "pcm_" ? "audio/x-raw" : "audio/x-" + name;
 }
 
-} // namespace discoverer
+} // namespace reader

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include "discoverer/Description.h"
+#include "reader/Description.h"
 
 #include <algorithm>
 #include <climits>
@@ -9,13 +9,13 @@ extern "C" {
 #include <libavutil/pixdesc.h>
 }
 
-#include "discoverer/MediaTypes.h"
-#include "discoverer/TagText.h"
 #include "probe/Completion.h"
 #include "probe/Duration.h"
+#include "reader/MediaTypes.h"
+#include "reader/TagText.h"
 #include "text/Text.h"
 
-namespace discoverer {
+namespace reader {
 
 using namespace LibMediaPlayer;
 
@@ -176,7 +176,7 @@ private:
 
 } // namespace
 
-Details readDetails(probe::MediaFile& file) {
+discoverer::Details readDetails(probe::MediaFile& file) {
     probe::complete(file);
     const AVFormatContext& context = file.context();
     const bool hasPicture = std::any_of(
@@ -185,4 +185,4 @@ Details readDetails(probe::MediaFile& file) {
     return {Describer(file).run(), hasPicture};
 }
 
-} // namespace discoverer
+} // namespace reader

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include "discoverer/DrawThumbnail.h"
+#include "reader/DrawThumbnail.h"
 
 #include <algorithm>
 #include <array>
@@ -8,13 +8,13 @@
 #include <utility>
 
 #include "LibMediaPlayer/Result.h"
-#include "discoverer/Canvas.h"
-#include "discoverer/FrameFinder.h"
-#include "discoverer/ImageEncoder.h"
-#include "discoverer/Layout.h"
-#include "discoverer/OpenMedia.h"
+#include "reader/Canvas.h"
+#include "reader/FrameFinder.h"
+#include "reader/ImageEncoder.h"
+#include "reader/Layout.h"
+#include "reader/OpenMedia.h"
 
-namespace discoverer {
+namespace reader {
 
 using namespace LibMediaPlayer;
 using probe::MediaFile;
@@ -57,7 +57,7 @@ std::array<Attempt, 4> attemptsFor(const MediaFile& file) {
 
 Layout layOutSmall(Size natural) {
     const bool isWide = natural.width >= natural.height;
-    const int side = std::min(kThumbnailSide, isWide ? natural.width : natural.height);
+    const int side = std::min(discoverer::kThumbnailSide, isWide ? natural.width : natural.height);
     return layOut(natural, isWide ? side : 0, isWide ? 0 : side).value_or(Layout{});
 }
 
@@ -104,8 +104,8 @@ int drawBrightScene(MediaFile& file, Canvas& brightest) {
 
 } // namespace
 
-Thumbnail drawThumbnail(probe::RegularFile file) {
-    Thumbnail thumbnail;
+discoverer::Thumbnail drawThumbnail(probe::RegularFile file) {
+    discoverer::Thumbnail thumbnail;
     std::unique_ptr<MediaFile> pFile;
     thumbnail.result = openMedia(std::move(file), kBounds, pFile);
     if (!pFile)
@@ -124,4 +124,4 @@ Thumbnail drawThumbnail(probe::RegularFile file) {
     return thumbnail;
 }
 
-} // namespace discoverer
+} // namespace reader

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include "discoverer/Canvas.h"
+#include "reader/Canvas.h"
 
 #include <utility>
 
@@ -8,9 +8,9 @@ extern "C" {
 }
 
 #include "LibMediaPlayer/Result.h"
-#include "discoverer/Scaler.h"
+#include "reader/Scaler.h"
 
-namespace discoverer {
+namespace reader {
 
 using namespace LibMediaPlayer;
 
@@ -78,4 +78,4 @@ int draw(const Picture& picture, const Layout& layout, Canvas& canvas) {
     return kOk;
 }
 
-} // namespace discoverer
+} // namespace reader

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include "discoverer/FrameFinder.h"
+#include "reader/FrameFinder.h"
 
 #include <algorithm>
 #include <cmath>
@@ -12,7 +12,7 @@ extern "C" {
 
 #include "LibMediaPlayer/Result.h"
 
-namespace discoverer {
+namespace reader {
 
 using namespace LibMediaPlayer;
 using probe::kAdopt;
@@ -245,4 +245,4 @@ int findCover(probe::MediaFile& file, Picture& picture) {
     return FrameFinder(file, *stream, kFrameBudget).runOnCover(picture);
 }
 
-} // namespace discoverer
+} // namespace reader

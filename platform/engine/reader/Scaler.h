@@ -5,10 +5,10 @@
 #include <cstdint>
 #include <vector>
 
-#include "discoverer/Layout.h"
 #include "probe/AvTypes.h"
+#include "reader/Layout.h"
 
-namespace discoverer {
+namespace reader {
 
 /** Scales and converts to pixels 0xAARRGGBB, by the frame's own colour matrix and range. */
 bool scaleToPixels(const AVFrame& frame, Size size, std::vector<std::uint32_t>& pixels);
@@ -23,4 +23,4 @@ inline constexpr std::size_t kReadAhead = 64;
 bool convertFromPixels(const std::vector<std::uint32_t>& pixels, Size size, AVPixelFormat format,
                        AVFrame& frame);
 
-} // namespace discoverer
+} // namespace reader

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include "discoverer/Scaler.h"
+#include "reader/Scaler.h"
 
 #include <algorithm>
 
@@ -7,7 +7,7 @@ extern "C" {
 #include <libswscale/swscale.h>
 }
 
-namespace discoverer {
+namespace reader {
 
 namespace {
 
@@ -100,4 +100,4 @@ bool convertFromPixels(const std::vector<std::uint32_t>& pixels, Size size, AVPi
            size.height;
 }
 
-} // namespace discoverer
+} // namespace reader

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include "discoverer/Layout.h"
+#include "reader/Layout.h"
 
 #include <algorithm>
 #include <utility>
@@ -8,7 +8,7 @@ extern "C" {
 #include <libavutil/mathematics.h>
 }
 
-namespace discoverer {
+namespace reader {
 
 namespace {
 
@@ -67,4 +67,4 @@ std::optional<Layout> layOut(Size natural, int width, int height) {
     return layout;
 }
 
-} // namespace discoverer
+} // namespace reader

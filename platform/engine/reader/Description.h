@@ -4,9 +4,9 @@
 #include "discoverer/Details.h"
 #include "probe/MediaFile.h"
 
-namespace discoverer {
+namespace reader {
 
 /** What a file is. Reads on in the file, and must be the last to do so. */
-Details readDetails(probe::MediaFile& file);
+discoverer::Details readDetails(probe::MediaFile& file);
 
-} // namespace discoverer
+} // namespace reader

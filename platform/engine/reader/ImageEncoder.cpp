@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: MIT
-#include "discoverer/ImageEncoder.h"
+#include "reader/ImageEncoder.h"
 
-#include "discoverer/Scaler.h"
+#include "reader/Scaler.h"
 
-namespace discoverer {
+namespace reader {
 
 using probe::kAdopt;
 
@@ -42,4 +42,4 @@ probe::Packet encode(const Canvas& canvas, const Encoding& encoding) {
     return isMade ? std::move(packet) : probe::Packet();
 }
 
-} // namespace discoverer
+} // namespace reader

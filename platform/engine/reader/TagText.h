@@ -5,7 +5,7 @@
 
 #include "probe/AvTypes.h"
 
-namespace discoverer {
+namespace reader {
 
 /**
  * The file's tags, one `KEY=value` a line: the well-known ones first, the others by name. Values
@@ -17,4 +17,4 @@ std::wstring tagText(const AVFormatContext& context);
 inline constexpr std::size_t kTagBytes = 12 * 1024;
 inline constexpr std::size_t kTagValueBytes = 2 * 1024;
 
-} // namespace discoverer
+} // namespace reader

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include "discoverer/Image.h"
+#include "reader/Image.h"
 
 #include <cerrno>
 #include <memory>
@@ -7,14 +7,15 @@
 #include <utility>
 
 #include "LibMediaPlayer/Result.h"
-#include "discoverer/Canvas.h"
-#include "discoverer/FrameFinder.h"
-#include "discoverer/ImageEncoder.h"
-#include "discoverer/OpenMedia.h"
+#include "reader/Canvas.h"
+#include "reader/FrameFinder.h"
+#include "reader/ImageEncoder.h"
+#include "reader/OpenMedia.h"
 
-namespace discoverer {
+namespace reader {
 
 using namespace LibMediaPlayer;
+using discoverer::ImageForm;
 using probe::MediaFile;
 
 namespace {
@@ -69,4 +70,4 @@ int drawImage(probe::RegularFile file, std::chrono::nanoseconds position, Size s
     return result == kOk ? writeImage(canvas, form, output) : result;
 }
 
-} // namespace discoverer
+} // namespace reader

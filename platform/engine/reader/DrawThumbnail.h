@@ -4,12 +4,12 @@
 #include "discoverer/Thumbnail.h"
 #include "probe/RegularFile.h"
 
-namespace discoverer {
+namespace reader {
 
 /**
  * Draws the file's cover or, without one, an early picture of the film that is not dark. Ends in
  * five seconds, whatever the file.
  */
-Thumbnail drawThumbnail(probe::RegularFile file);
+discoverer::Thumbnail drawThumbnail(probe::RegularFile file);
 
-} // namespace discoverer
+} // namespace reader

@@ -5,10 +5,10 @@
 
 #include "probe/MediaFile.h"
 
-namespace discoverer {
+namespace reader {
 
 /** Opens a file that has something to play. Returns 0 or a LibMediaPlayer::Result. */
 int openMedia(probe::RegularFile file, probe::MediaFile::Bounds bounds,
               std::unique_ptr<probe::MediaFile>& pFile);
 
-} // namespace discoverer
+} // namespace reader

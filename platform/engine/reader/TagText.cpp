@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include "discoverer/TagText.h"
+#include "reader/TagText.h"
 
 #include <algorithm>
 #include <iterator>
@@ -8,7 +8,7 @@
 
 #include "text/Text.h"
 
-namespace discoverer {
+namespace reader {
 
 namespace {
 
@@ -145,4 +145,4 @@ std::wstring tagText(const AVFormatContext& context) {
     return lines.take();
 }
 
-} // namespace discoverer
+} // namespace reader

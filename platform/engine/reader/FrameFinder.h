@@ -5,7 +5,7 @@
 
 #include "probe/MediaFile.h"
 
-namespace discoverer {
+namespace reader {
 
 /** A decoded picture and how it is to be looked at. */
 struct Picture {
@@ -32,4 +32,4 @@ int findPicture(probe::MediaFile& file, std::chrono::nanoseconds position, Pictu
 /** The picture that stands for the whole file. kNotAvailable when there is none. */
 int findCover(probe::MediaFile& file, Picture& picture);
 
-} // namespace discoverer
+} // namespace reader

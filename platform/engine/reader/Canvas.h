@@ -4,10 +4,10 @@
 #include <cstdint>
 #include <vector>
 
-#include "discoverer/FrameFinder.h"
-#include "discoverer/Layout.h"
+#include "reader/FrameFinder.h"
+#include "reader/Layout.h"
 
-namespace discoverer {
+namespace reader {
 
 /** Rows of opaque pixels 0xAARRGGBB. They have reserved room for kReadAhead more. */
 struct Canvas {
@@ -18,4 +18,4 @@ struct Canvas {
 /** Draws the picture where the layout says. Returns 0 or a LibMediaPlayer::Result. */
 int draw(const Picture& picture, const Layout& layout, Canvas& canvas);
 
-} // namespace discoverer
+} // namespace reader

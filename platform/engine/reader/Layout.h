@@ -8,7 +8,7 @@ extern "C" {
 #include <libavutil/rational.h>
 }
 
-namespace discoverer {
+namespace reader {
 
 struct Size {
     int width = 0;
@@ -36,4 +36,4 @@ Size naturalSize(Size frame, AVRational pixelAspect, int rotation);
  */
 std::optional<Layout> layOut(Size natural, int width, int height);
 
-} // namespace discoverer
+} // namespace reader

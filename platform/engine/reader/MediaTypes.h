@@ -5,7 +5,7 @@
 
 #include "probe/MediaFile.h"
 
-namespace discoverer {
+namespace reader {
 
 /** The container's media type, such as "video/mp4"; "audio/mp4" when it holds sound alone. */
 std::string containerType(probe::MediaFile& file);
@@ -13,4 +13,4 @@ std::string containerType(probe::MediaFile& file);
 /** The codec's media type, such as "video/x-h264". */
 std::string codecType(const AVCodecParameters& stream);
 
-} // namespace discoverer
+} // namespace reader

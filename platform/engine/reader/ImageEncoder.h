@@ -1,10 +1,10 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include "discoverer/Canvas.h"
 #include "probe/AvTypes.h"
+#include "reader/Canvas.h"
 
-namespace discoverer {
+namespace reader {
 
 struct Encoding {
     AVCodecID codec;
@@ -19,4 +19,4 @@ inline constexpr Encoding kSmallJpeg{AV_CODEC_ID_MJPEG, AV_PIX_FMT_YUVJ420P, 5};
 /** A whole image file in memory; an empty handle when it cannot be made. */
 probe::Packet encode(const Canvas& canvas, const Encoding& encoding);
 
-} // namespace discoverer
+} // namespace reader

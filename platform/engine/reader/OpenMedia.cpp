@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include "discoverer/OpenMedia.h"
+#include "reader/OpenMedia.h"
 
 #include <algorithm>
 #include <utility>
@@ -7,7 +7,7 @@
 
 #include "LibMediaPlayer/Result.h"
 
-namespace discoverer {
+namespace reader {
 
 using namespace LibMediaPlayer;
 using probe::MediaFile;
@@ -38,4 +38,4 @@ int openMedia(probe::RegularFile file, MediaFile::Bounds bounds,
     return kOk;
 }
 
-} // namespace discoverer
+} // namespace reader
