@@ -68,7 +68,7 @@ void addTags(Input& input, AVDictionary*& dictionary) {
         std::string value = input.bytes(input.byte());
         // Longer than any input, so that the bounds are met.
         if (const auto times = input.byte(); times > 200)
-            for (int doubled = times - 200; doubled > 0 && value.size() < 32768; --doubled)
+            for (int doubled = times - 200; doubled > 0 && value.size() < 4096; --doubled)
                 value += value;
         av_dict_set(&dictionary, name.c_str(), value.c_str(), AV_DICT_DONT_OVERWRITE);
     }
