@@ -4,6 +4,7 @@
 option(QNS_BUILD_TESTS "Build the tests" ON)
 option(QNS_BUILD_BENCH "Build qnsmedia-bench" OFF)
 option(QNS_BUILD_FUZZERS "Build the libFuzzer targets (clang only)" OFF)
+option(QNS_COVERAGE "Count what of the code is reached (clang only)" OFF)
 set(QNS_SANITIZE "" CACHE STRING "Sanitizers for the whole build, as for -fsanitize=")
 
 set(CMAKE_CXX_STANDARD 17)
@@ -39,6 +40,11 @@ if(QNS_SANITIZE)
         # when there are no more descriptors: tests use them all up.
         add_compile_options(-fno-sanitize=vptr)
     endif()
+endif()
+
+if(QNS_COVERAGE)
+    add_compile_options(-fprofile-instr-generate -fcoverage-mapping)
+    add_link_options(-fprofile-instr-generate)
 endif()
 
 # A static library per source folder: qns_add_folder(NAME SOURCES... LINKS...)
