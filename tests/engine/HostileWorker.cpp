@@ -63,6 +63,17 @@ std::string lie() {
     return message.bytes();
 }
 
+/** Says more than a client could be told. */
+std::string boast() {
+    constexpr std::size_t kLength = 25'000;
+    int result = LibMediaPlayer::kOk;
+    discoverer::Details details;
+    details.info.system.tags.assign(kLength, L'x');
+    worker::MessageWriter message;
+    message(result, details);
+    return message.bytes();
+}
+
 bool isForbidden(long outcome) {
     return outcome < 0 && errno == EPERM;
 }
@@ -106,6 +117,8 @@ std::string answer(worker::Request& request, Files files) {
         return bloat();
     if (order == "lie")
         return lie();
+    if (order == "boast")
+        return boast();
     if (order == "babble")
         return std::string(1000, '\x7f');
     if (order == "break out")

@@ -115,7 +115,7 @@ TEST_F(Worker, AFileThatHasTakenItOverReachesNothing) {
 #endif
 
 TEST_F(Worker, OneThatSaysWhatCannotBeIsNotBelievedNorAskedAgain) {
-    for (const char* const order : {"lie", "babble"}) {
+    for (const char* const order : {"lie", "boast", "babble"}) {
         const pid_t liar = idleWorker(mPool);
         EXPECT_EQ(describe(hostile(order)), kInternal) << order;
         EXPECT_TRUE(isGone(liar)) << order;

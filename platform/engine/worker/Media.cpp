@@ -4,6 +4,7 @@
 #include <utility>
 
 #include "LibMediaPlayer/Result.h"
+#include "text/Text.h"
 #include "worker/Message.h"
 
 namespace worker {
@@ -39,10 +40,25 @@ bool isPossible(const Reply& /*reply*/) {
     return true;
 }
 
+/** With all else that is told of a file they must fit into one answer to a client. */
+constexpr std::size_t kTextBytes = 18 * 1024;
+
+std::size_t textBytes(const MediaMetaInfo& info) {
+    const auto bytesOf = [](const std::string& type, const std::wstring& text) {
+        return type.size() + engine::toUtf8(text).size();
+    };
+    std::size_t bytes = bytesOf(info.system.mediaType, info.system.tags) +
+                        bytesOf(info.video.mediaType, info.video.description);
+    for (const AudioMetaInfo& audio : info.audio)
+        bytes += bytesOf(audio.mediaType, audio.description);
+    return bytes;
+}
+
 bool isPossible(const discoverer::Details& details) {
     const MediaMetaInfo& info = details.info;
     return info.videoCount >= 0 && info.videoCount <= 1 && info.audioCount >= 0 &&
-           info.audioCount <= static_cast<std::int32_t>(info.audio.size());
+           info.audioCount <= static_cast<std::int32_t>(info.audio.size()) &&
+           textBytes(info) <= kTextBytes;
 }
 
 template<typename Reply>
