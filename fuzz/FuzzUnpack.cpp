@@ -1,12 +1,15 @@
 // SPDX-License-Identifier: MIT
-// Decodes arbitrary bytes, value by value and as the fields of a request.
+// Decodes arbitrary bytes, value by value, as the fields of a request, and as what a worker says.
 #include "pack/ArgumentReader.h"
 #include "pack/CPack.h"
 #include "pack/CUnpack.h"
+#include "worker/Message.h"
+#include "worker/Request.h"
 
 #include <array>
 #include <cstdlib>
 #include <string>
+#include <string_view>
 
 namespace {
 
@@ -76,10 +79,34 @@ void readFields(const uint8_t* data, size_t size) {
     }
 }
 
+/** What is read is written and read again as the same. */
+template<typename Record>
+void readRecord(std::string_view bytes) {
+    Record record;
+    worker::MessageReader message(bytes);
+    message(record);
+    if (!message.isGood())
+        return;
+    worker::MessageWriter once;
+    once(record);
+    worker::MessageReader again(once.bytes());
+    again(record);
+    require(again.isGood());
+    worker::MessageWriter twice;
+    twice(record);
+    require(twice.bytes() == once.bytes());
+}
+
 } // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
     decodeEveryValue(data, size);
     readFields(data, size);
+    const std::string_view bytes(reinterpret_cast<const char*>(data), size);
+    readRecord<worker::Request>(bytes);
+    readRecord<worker::Demuxers>(bytes);
+    readRecord<worker::Looked>(bytes);
+    readRecord<discoverer::Details>(bytes);
+    readRecord<discoverer::Thumbnail>(bytes);
     return 0;
 }
