@@ -5,6 +5,7 @@
 
 #include <CLI/CLI.hpp>
 #include <cstdio>
+#include <exception>
 #include <iostream>
 #include <sched.h>
 
@@ -46,11 +47,21 @@ bool pinTo(int core) {
     return false;
 }
 
+/** What was measured before something went wrong stays in the report. */
+int measure(const Bench& bench, const bench::Options& options, bench::Report& report) {
+    try {
+        return bench.run(options, report);
+    } catch (const std::exception& error) {
+        std::fprintf(stderr, "qnsmedia-bench: %s: %s\n", bench.name, error.what());
+        return 1;
+    }
+}
+
 int run(const Bench& bench, const CommonOptions& options) {
     if (options.core >= 0 && !pinTo(options.core))
         return 1;
     bench::Report report;
-    const int status = bench.run(options.bench, report);
+    const int status = measure(bench, options.bench, report);
     if (options.json)
         report.printJson(std::cout);
     else

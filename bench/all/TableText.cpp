@@ -13,7 +13,7 @@ namespace bench {
 namespace {
 
 using Json = nlohmann::ordered_json;
-using Cells = std::array<std::string, 5>;
+using Cells = std::array<std::string, 6>;
 
 std::string comparedText(const std::optional<Compared>& compared) {
     if (!compared)
@@ -36,11 +36,15 @@ std::string verdictsText(const std::vector<Verdict>& verdicts) {
 }
 
 Cells cellsOf(const TableLine& line) {
-    return {line.bench + ": " + line.name, figureText(line.ours) + " " + line.unit,
-            comparedText(line.floor), comparedText(line.peer), verdictsText(line.verdicts)};
+    return {line.bench,
+            line.name,
+            figureText(line.ours) + " " + line.unit,
+            comparedText(line.floor),
+            comparedText(line.peer),
+            verdictsText(line.verdicts)};
 }
 
-void printCells(std::ostream& out, const Cells& cells, const std::array<std::size_t, 5>& widths) {
+void printCells(std::ostream& out, const Cells& cells, const std::array<std::size_t, 6>& widths) {
     std::string text;
     for (std::size_t i = 0; i < cells.size(); ++i) {
         text += cells[i];
@@ -89,10 +93,10 @@ Json toJson(const std::vector<TableLine>& lines) {
 
 void printLines(std::ostream& out, const std::vector<TableLine>& lines) {
     std::vector<Cells> table = {
-        {"measurement", "ours", "floor (ratio)", "best peer (ratio; range)", "goal"}};
+        {"bench", "measurement", "ours", "floor (ratio)", "best peer (ratio; range)", "goal"}};
     for (const TableLine& line : lines)
         table.push_back(cellsOf(line));
-    std::array<std::size_t, 5> widths{};
+    std::array<std::size_t, 6> widths{};
     for (const Cells& cells : table)
         for (std::size_t i = 0; i < cells.size(); ++i)
             widths[i] = std::max(widths[i], cells[i].size());

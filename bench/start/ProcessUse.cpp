@@ -4,13 +4,17 @@
 #include <filesystem>
 #include <fstream>
 #include <string>
+#include <system_error>
 #include <unistd.h>
+#include <vector>
 
 namespace bench {
 namespace {
 
+namespace fs = std::filesystem;
+
 /** The number behind `label` in a file of "label: number" lines. */
-int64_t numberBehind(const std::filesystem::path& file, const std::string& label) {
+int64_t numberBehind(const fs::path& file, const std::string& label) {
     std::ifstream in(file);
     std::string word;
     while (in >> word) {
@@ -22,7 +26,7 @@ int64_t numberBehind(const std::filesystem::path& file, const std::string& label
 }
 
 /** User and system time of the whole process. */
-double cpuSecondsOf(const std::filesystem::path& process) {
+double cpuSecondsOf(const fs::path& process) {
     std::ifstream in(process / "stat");
     std::string text((std::istreambuf_iterator<char>(in)), {});
     std::size_t at = text.rfind(')');
@@ -37,25 +41,51 @@ double cpuSecondsOf(const std::filesystem::path& process) {
     return static_cast<double>(user + system) / static_cast<double>(::sysconf(_SC_CLK_TCK));
 }
 
+fs::path folderOf(pid_t pid) {
+    return "/proc/" + std::to_string(pid);
+}
+
+double megabytesBehind(const fs::path& file, const std::string& label) {
+    return static_cast<double>(numberBehind(file, label)) / 1024.0;
+}
+
+/** The process and all below it. */
+std::vector<pid_t> familyOf(pid_t pid) {
+    std::vector<pid_t> family = {pid};
+    for (std::size_t i = 0; i < family.size(); ++i) {
+        std::error_code gone;
+        for (const auto& task : fs::directory_iterator(folderOf(family[i]) / "task", gone)) {
+            std::ifstream children(task.path() / "children");
+            for (pid_t child = 0; children >> child;)
+                family.push_back(child);
+        }
+    }
+    return family;
+}
+
+void addUse(pid_t pid, ProcessUse& use) {
+    const fs::path process = folderOf(pid);
+    use.residentMegabytes += megabytesBehind(process / "status", "VmRSS:");
+    use.anonymousMegabytes += megabytesBehind(process / "status", "RssAnon:");
+    use.cpuSeconds += cpuSecondsOf(process);
+    std::error_code gone;
+    for (const auto& task : fs::directory_iterator(process / "task", gone))
+        use.contextSwitches += numberBehind(task.path() / "status", "voluntary_ctxt_switches:");
+}
+
 } // namespace
 
 ProcessUse readProcessUse(pid_t pid) {
-    const std::filesystem::path process = "/proc/" + std::to_string(pid);
     ProcessUse use;
-    use.residentMegabytes =
-        static_cast<double>(numberBehind(process / "status", "VmRSS:")) / 1024.0;
-    use.cpuSeconds = cpuSecondsOf(process);
-    for (const auto& task : std::filesystem::directory_iterator(process / "task"))
-        use.contextSwitches += numberBehind(task.path() / "status", "voluntary_ctxt_switches:");
+    for (const pid_t member : familyOf(pid))
+        addUse(member, use);
     return use;
 }
 
 double readPeakMegabytes(pid_t pid) {
-    const std::filesystem::path process = "/proc/" + std::to_string(pid);
-    double sum = static_cast<double>(numberBehind(process / "status", "VmHWM:")) / 1024.0;
-    std::ifstream children(process / "task" / std::to_string(pid) / "children");
-    for (pid_t child = 0; children >> child;)
-        sum += readPeakMegabytes(child);
+    double sum = 0;
+    for (const pid_t member : familyOf(pid))
+        sum += megabytesBehind(folderOf(member) / "status", "VmHWM:");
     return sum;
 }
 

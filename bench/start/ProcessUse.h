@@ -6,9 +6,11 @@
 
 namespace bench {
 
-/** What the kernel tells of a process. */
+/** What the kernel tells of a process and its children, in sum. */
 struct ProcessUse {
-    double residentMegabytes = 0;
+    double residentMegabytes = 0; ///< what several have in common counts for each
+    double anonymousMegabytes =
+        0; ///< the same without what is a part of files: programs, libraries
     double cpuSeconds = 0;
     int64_t contextSwitches = 0;
 };

@@ -77,6 +77,7 @@ Row measureStart(const std::vector<Contender>& contenders, int rounds) {
 void measureIdle(const std::vector<Contender>& contenders, std::chrono::seconds idle,
                  Report& report) {
     Row memory{"resident when idle", "MB", {}};
+    Row own{"resident when idle, without parts of files", "MB", {}};
     Row load{"processor when idle", "%", {}};
     Row wakeUps{"context switches a second when idle", "1/s", {}};
     std::vector<ChildProcess> processes;
@@ -96,11 +97,12 @@ void measureIdle(const std::vector<Contender>& contenders, std::chrono::seconds 
             row.entries.push_back({contenders[i].name, summarize({figure}), contenders[i].role});
         };
         add(memory, after.residentMegabytes);
+        add(own, after.anonymousMegabytes);
         add(load, 100 * (after.cpuSeconds - before[i].cpuSeconds) / seconds);
         add(wakeUps,
             static_cast<double>(after.contextSwitches - before[i].contextSwitches) / seconds);
     }
-    for (Row* row : {&memory, &load, &wakeUps})
+    for (Row* row : {&memory, &own, &load, &wakeUps})
         report.add(std::move(*row));
 }
 

@@ -114,7 +114,7 @@ TEST(Table, PrintsFiguresRatiosAndGoals) {
     report.add(opening("film.mp4", 2, 5));
     std::ostringstream out;
     bench::printLines(out, linesOf("player", report));
-    EXPECT_THAT(out.str(), HasSubstr("player: films, open to ready"));
+    EXPECT_THAT(out.str(), HasSubstr("player  films, open to ready"));
     EXPECT_THAT(out.str(), HasSubstr("2.00 ms"));
     EXPECT_THAT(out.str(), HasSubstr("libmpv 5.00 (2.50)"));
     EXPECT_THAT(out.str(), HasSubstr("2 x libmpv: met\n"));
