@@ -5,6 +5,7 @@
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
+#include <functional>
 #include <string>
 #include <thread>
 
@@ -73,37 +74,46 @@ Row measureStart(const std::vector<Contender>& contenders, int rounds) {
     return row;
 }
 
+std::vector<ProcessUse> usesOf(const std::vector<ChildProcess>& processes) {
+    std::vector<ProcessUse> uses;
+    for (const ChildProcess& process : processes)
+        uses.push_back(readProcessUse(process.pid()));
+    return uses;
+}
+
+using Figure = std::function<double(const ProcessUse& before, const ProcessUse& after)>;
+
 /** All contenders side by side, for so many seconds without anything to do. */
 void measureIdle(const std::vector<Contender>& contenders, std::chrono::seconds idle,
                  Report& report) {
-    Row memory{"resident when idle", "MB", {}};
-    Row own{"resident when idle, without parts of files", "MB", {}};
-    Row load{"processor when idle", "%", {}};
-    Row wakeUps{"context switches a second when idle", "1/s", {}};
     std::vector<ChildProcess> processes;
     for (const Contender& contender : contenders) {
         processes.push_back(ChildProcess::run(contender.command));
         connectTo(contender.port);
     }
     std::this_thread::sleep_for(kSettle);
-    std::vector<ProcessUse> before;
-    for (const ChildProcess& process : processes)
-        before.push_back(readProcessUse(process.pid()));
+    const std::vector<ProcessUse> before = usesOf(processes);
     std::this_thread::sleep_for(idle);
+    const std::vector<ProcessUse> after = usesOf(processes);
+
+    const auto addRow = [&](const char* name, const char* unit, const Figure& figure) {
+        Row row{name, unit, {}};
+        for (std::size_t i = 0; i < contenders.size(); ++i)
+            row.entries.push_back(
+                {contenders[i].name, summarize({figure(before[i], after[i])}), contenders[i].role});
+        report.add(std::move(row));
+    };
     const auto seconds = static_cast<double>(idle.count());
-    for (std::size_t i = 0; i < contenders.size(); ++i) {
-        const ProcessUse after = readProcessUse(processes[i].pid());
-        const auto add = [&](Row& row, double figure) {
-            row.entries.push_back({contenders[i].name, summarize({figure}), contenders[i].role});
-        };
-        add(memory, after.residentMegabytes);
-        add(own, after.anonymousMegabytes);
-        add(load, 100 * (after.cpuSeconds - before[i].cpuSeconds) / seconds);
-        add(wakeUps,
-            static_cast<double>(after.contextSwitches - before[i].contextSwitches) / seconds);
-    }
-    for (Row* row : {&memory, &own, &load, &wakeUps})
-        report.add(std::move(*row));
+    using Use = const ProcessUse&;
+    addRow("resident when idle", "MB", [](Use, Use use) { return use.residentMegabytes; });
+    addRow("resident when idle, without parts of files", "MB",
+           [](Use, Use use) { return use.anonymousMegabytes; });
+    addRow("processor when idle", "%", [=](Use first, Use last) {
+        return 100 * (last.cpuSeconds - first.cpuSeconds) / seconds;
+    });
+    addRow("context switches a second when idle", "1/s", [=](Use first, Use last) {
+        return static_cast<double>(last.contextSwitches - first.contextSwitches) / seconds;
+    });
 }
 
 } // namespace
