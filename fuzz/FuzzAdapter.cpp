@@ -87,11 +87,16 @@ private:
                               isRemote, false);
     }
 
-    /** Lets the worker do all that it has been asked for, and then the main thread. */
+    /** Lets the worker do all that it has been asked for. */
+    void finishWork() {
+        using fuzz::Services;
+        mpServices->receive(event(Services::kDoneObjectId, Services::kDoneMethod, {}, true));
+        mpServices->waitUntilDone(++mFinished);
+    }
+
+    /** And then the main thread what the worker has left to it. */
     void settle() {
-        mpServices->receive(
-            event(fuzz::Services::kDoneObjectId, fuzz::Services::kDoneMethod, {}, true));
-        mpServices->waitUntilDone(++mSettled);
+        finishWork();
         fuzz::Services::runQueued();
     }
 
@@ -144,15 +149,16 @@ private:
         }
     }
 
+    /** The main thread may have something to do for the client yet. */
     void endClient() {
-        settle();
+        finishWork();
         mpServices->endProxy(mInput.byte());
     }
 
     fuzz::Input mInput;
     fuzz::Ledger mLedger;
     std::unique_ptr<fuzz::Services> mpServices;
-    int mSettled = 0;
+    int mFinished = 0;
 };
 
 } // namespace
