@@ -110,9 +110,11 @@ MediaSet makeMedia(const std::filesystem::path& folder) {
 /** The engine beside the library that it could have left the work to. */
 void compareLibraries(const MediaSet& set, int rounds, Report& report) {
     const auto engine = makeEngineReader();
+    const auto workerless = makeWorkerlessReader();
     const auto libav = makeLibavReader();
     const std::vector<Contender> contenders = {
         {"engine", Role::ours, [&](const std::string& path) { engine->read(path); }},
+        {"without a worker", Role::floor, [&](const std::string& path) { workerless->read(path); }},
         {"libavformat", Role::peer, [&](const std::string& path) { libav->read(path); }}};
     report.add(compareRepeated("metadata by the engine, repeated", set.all, rounds, contenders));
     report.add(compare("metadata by the engine", set.all, rounds, contenders));

@@ -15,6 +15,8 @@ extern "C" {
 #include "LibMediaPlayer/InterfaceFactory.h"
 #include "bench/ChildProcess.h"
 #include "qnsmedia/Discoverer.h"
+#include "reader/Description.h"
+#include "reader/OpenMedia.h"
 
 namespace bench {
 namespace {
@@ -51,6 +53,21 @@ public:
 private:
     const std::unique_ptr<LibMediaPlayer::IMediaDiscoverer> mpDiscoverer{
         LibMediaPlayer::InterfaceFactory::createDiscoverer()};
+};
+
+class WorkerlessReader : public MediaReader {
+public:
+    void read(const std::string& path) override {
+        probe::RegularFile file;
+        std::unique_ptr<probe::MediaFile> pMedia;
+        require(file.open(path) == 0 &&
+                    reader::openMedia(std::move(file), probe::MediaFile::kLook, pMedia) == 0,
+                path);
+        mDetails = reader::readDetails(*pMedia);
+    }
+
+private:
+    discoverer::Details mDetails; ///< so that they are not made for nothing
 };
 
 class LibavReader : public MediaReader {
@@ -114,6 +131,10 @@ std::unique_ptr<MediaReader> makeDaemonReader(qnsmedia::Connection& connection) 
 
 std::unique_ptr<MediaReader> makeEngineReader() {
     return std::make_unique<EngineReader>();
+}
+
+std::unique_ptr<MediaReader> makeWorkerlessReader() {
+    return std::make_unique<WorkerlessReader>();
 }
 
 std::unique_ptr<MediaReader> makeLibavReader() {

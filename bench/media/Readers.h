@@ -18,8 +18,10 @@ public:
 
 /** Through the daemon: open, metadata, close. */
 std::unique_ptr<MediaReader> makeDaemonReader(qnsmedia::Connection& connection);
-/** The engine in this process. */
+/** The engine, without the daemon. */
 std::unique_ptr<MediaReader> makeEngineReader();
+/** What the engine's workers do, in this process. */
+std::unique_ptr<MediaReader> makeWorkerlessReader();
 /** libavformat as its documentation has one use it. */
 std::unique_ptr<MediaReader> makeLibavReader();
 /** A command whose last argument is the file. */
