@@ -5,11 +5,11 @@
 #include <cstdio>
 #include <cstdlib>
 #include <filesystem>
-#include <unistd.h>
 
 #include "bench/Benches.h"
 #include "bench/Programs.h"
 #include "bench/Report.h"
+#include "bench/ScratchFolder.h"
 #include "bench/import/Collection.h"
 #include "bench/import/Importers.h"
 #include "bench/rpc/PacketSocket.h"
@@ -91,8 +91,8 @@ int runImport(const Options& options, Report& report) {
     ::setenv("QT_QPA_PLATFORM", "offscreen", 0);
     const int rounds = roundsOf(options, kDefaultRounds, 1);
     const int files = options.quick ? kQuickFiles : kFiles;
-    const fs::path folder =
-        fs::temp_directory_path() / ("qnsmedia-bench-" + std::to_string(::getpid()));
+    const ScratchFolder scratch;
+    const fs::path& folder = scratch.path();
     const std::vector<std::string>& parts = options.arguments;
     const auto wanted = [&](const char* part) {
         return parts.empty() || std::find(parts.begin(), parts.end(), part) != parts.end();
@@ -105,7 +105,6 @@ int runImport(const Options& options, Report& report) {
     if (wanted("covers"))
         compare("import of mp3 with covers", {options.quick ? kQuickCovers : kFiles, {"mp3"}, true},
                 folder, rounds, report);
-    fs::remove_all(folder);
     return 0;
 }
 

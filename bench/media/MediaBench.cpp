@@ -10,12 +10,12 @@
 #include <functional>
 #include <memory>
 #include <nlohmann/json.hpp>
-#include <unistd.h>
 
 #include "bench/Benches.h"
 #include "bench/ChildProcess.h"
 #include "bench/Programs.h"
 #include "bench/Report.h"
+#include "bench/ScratchFolder.h"
 #include "bench/media/Readers.h"
 #include "bench/rpc/PacketSocket.h"
 
@@ -160,8 +160,8 @@ void compareDrawers(qnsmedia::Connection& connection, const std::string& name, i
 
 int runMedia(const Options& options, Report& report) {
     isolateNetwork();
-    const std::filesystem::path folder =
-        std::filesystem::temp_directory_path() / ("qnsmedia-bench-" + std::to_string(::getpid()));
+    const ScratchFolder scratch;
+    const std::filesystem::path& folder = scratch.path();
     const MediaSet set = makeMedia(folder);
     if (set.all.empty())
         return 1;
@@ -173,7 +173,6 @@ int runMedia(const Options& options, Report& report) {
     compareReaders(connection, set, rounds, report);
     compareDrawers(connection, "picture of a key frame", 0, set, rounds, report);
     compareDrawers(connection, "picture between key frames", 1, set, rounds, report);
-    std::filesystem::remove_all(folder);
     return 0;
 }
 

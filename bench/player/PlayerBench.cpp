@@ -6,10 +6,10 @@
 #include <cstdio>
 #include <cstdlib>
 #include <filesystem>
-#include <unistd.h>
 
 #include "bench/Benches.h"
 #include "bench/Report.h"
+#include "bench/ScratchFolder.h"
 #include "bench/player/PlayerPeer.h"
 
 namespace bench {
@@ -106,8 +106,8 @@ std::vector<std::filesystem::path> filesIn(const std::filesystem::path& folder) 
 } // namespace
 
 int runPlayer(const Options& options, Report& report) {
-    const std::filesystem::path folder =
-        std::filesystem::temp_directory_path() / ("qnsmedia-bench-" + std::to_string(::getpid()));
+    const ScratchFolder scratch;
+    const std::filesystem::path& folder = scratch.path();
     const std::string make = std::string(QNS_MAKE_MEDIA) + " '" + folder.string() + "'";
     if (std::system(make.c_str()) != 0)
         return 1;
@@ -118,7 +118,6 @@ int runPlayer(const Options& options, Report& report) {
     const int loopRounds = options.quick ? kQuickLoopRounds : kLoopRounds;
     for (const std::filesystem::path& file : filesIn(folder))
         measureFile(file, rounds, loopRounds, contenders, report);
-    std::filesystem::remove_all(folder);
     return 0;
 }
 

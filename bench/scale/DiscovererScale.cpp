@@ -4,11 +4,11 @@
 #include <filesystem>
 #include <functional>
 #include <memory>
-#include <unistd.h>
 
 #include "bench/Benches.h"
 #include "bench/ChildProcess.h"
 #include "bench/Programs.h"
+#include "bench/ScratchFolder.h"
 #include "bench/import/Collection.h"
 #include "bench/media/Readers.h"
 #include "bench/rpc/PacketSocket.h"
@@ -60,8 +60,8 @@ void compare(const std::vector<Contender>& contenders, const std::vector<std::st
 
 bool measureDiscoverers(const Options& options, Report& report) {
     isolateNetwork();
-    const fs::path folder =
-        fs::temp_directory_path() / ("qnsmedia-bench-" + std::to_string(::getpid()));
+    const ScratchFolder scratch;
+    const fs::path& folder = scratch.path();
     const std::vector<std::string> files = makeCollection(
         folder,
         {options.quick ? kQuickFiles : kFiles, {"mp3", "flac", "ogg", "m4a", "wav"}, false});
@@ -71,7 +71,6 @@ bool measureDiscoverers(const Options& options, Report& report) {
     compare({{"daemon", Role::ours, [&] { return makeDaemonReader(connection); }},
              {"engine alone", Role::floor, [] { return makeEngineReader(); }}},
             files, roundsOf(options, kDefaultRounds, 1), report);
-    fs::remove_all(folder);
     return true;
 }
 

@@ -5,9 +5,9 @@
 #include <filesystem>
 #include <functional>
 #include <string>
-#include <unistd.h>
 
 #include "bench/Benches.h"
+#include "bench/ScratchFolder.h"
 #include "bench/scale/CurveBuilder.h"
 #include "bench/scale/Scales.h"
 #include "library/Database.h"
@@ -144,14 +144,12 @@ void measureAll(const fs::path& file, const std::vector<int>& sizes, int rounds,
 } // namespace
 
 bool measureLibraryRows(const Options& options, Report& report) {
-    const fs::path folder =
-        fs::temp_directory_path() / ("qnsmedia-bench-rows-" + std::to_string(::getpid()));
-    fs::create_directories(folder);
+    const ScratchFolder scratch;
+    const fs::path& folder = scratch.path();
     std::vector<int> sizes = {1'000, 3'000, 10'000};
     if (!options.quick)
         sizes.insert(sizes.end(), {30'000, 100'000});
     measureAll(folder / "media.db", sizes, roundsOf(options, kDefaultRounds, 1), report);
-    fs::remove_all(folder);
     return true;
 }
 

@@ -13,6 +13,7 @@
 #include "bench/ChildProcess.h"
 #include "bench/Programs.h"
 #include "bench/Report.h"
+#include "bench/ScratchFolder.h"
 #include "bench/rpc/PacketSocket.h"
 #include "bench/start/ProcessUse.h"
 
@@ -120,13 +121,12 @@ void measureIdle(const std::vector<Contender>& contenders, std::chrono::seconds 
 
 int runStart(const Options& options, Report& report) {
     isolateNetwork();
-    const std::filesystem::path folder =
-        std::filesystem::temp_directory_path() / ("qnsmedia-bench-" + std::to_string(::getpid()));
+    const ScratchFolder scratch;
+    const std::filesystem::path& folder = scratch.path();
     ::setenv("QT_QPA_PLATFORM", "offscreen", 0);
     const std::vector<Contender> contenders = contendersIn(folder, report);
     report.add(measureStart(contenders, roundsOf(options, kDefaultRounds, kQuickRounds)));
     measureIdle(contenders, options.quick ? kQuickIdle : kIdle, report);
-    std::filesystem::remove_all(folder);
     return 0;
 }
 
