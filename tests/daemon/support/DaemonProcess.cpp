@@ -205,6 +205,12 @@ bool DaemonProcess::endsBefore(patience::Clock::time_point deadline, int process
 }
 
 int DaemonProcess::waitForExit() {
+    const int status = waitForEnd();
+    mOutput.waitForEnd();
+    return status;
+}
+
+int DaemonProcess::waitForEnd() {
     if (mStatus)
         return *mStatus;
     if (mPid <= 0)
@@ -217,7 +223,6 @@ int DaemonProcess::waitForExit() {
     int status = 0;
     ::waitpid(mPid, &status, 0);
     mStatus = shellStatus(status);
-    mOutput.waitForEnd();
     return *mStatus;
 }
 
@@ -262,7 +267,9 @@ void DaemonProcess::limitFreeDescriptors(std::size_t count) const {
          left > 0 || exists(symlink_status(open / std::to_string(number))); ++number)
         if (!exists(symlink_status(open / std::to_string(number))))
             --left;
-    const rlimit limit{number, number};
+    rlimit limit{};
+    ::prlimit(mPid, RLIMIT_NOFILE, nullptr, &limit);
+    limit.rlim_cur = number;
     EXPECT_EQ(::prlimit(mPid, RLIMIT_NOFILE, &limit, nullptr), 0) << std::strerror(errno);
 }
 

@@ -75,6 +75,9 @@ public:
     /** Waits for the end. What the shell would call the exit status: 128 + n for signal n. */
     int waitForExit();
 
+    /** The same, but does not wait for all output: a process that it started may still write. */
+    int waitForEnd();
+
     /** signal(SIGTERM) and waitForExit(). */
     int terminate();
 
@@ -90,7 +93,7 @@ public:
     /** Waits until there are no more than that many of either. */
     [[nodiscard]] bool waitForResources(std::size_t descriptors, std::size_t threads) const;
 
-    /** Lets the process open this many descriptors more, and then no more. */
+    /** Lets the process open this many descriptors more, and then no more, until told again. */
     void limitFreeDescriptors(std::size_t count) const;
 
 private:

@@ -27,7 +27,7 @@ public:
     /** `road` must be connected, and outlive this one. */
     Life(WireClient& road, long identity) : WireClient(identity), mRoad(road) {}
 
-    /** Over a connection of its own. */
+    /** Over a connection of its own, which it makes at once. */
     explicit Life(long identity) : WireClient(identity), mRoad(*this) { connect(); }
 
     /** Registers a callback object and waits for the client id; -1 when there is no answer. */

@@ -28,12 +28,21 @@ unsigned seed() {
 } // namespace
 
 void LoadTest::SetUp() {
-    const unsigned number = seed();
-    std::printf("QNS_LOAD_SEED=%u\n", number);
-    mSyslog.keepOnly("onSystemSingleCaught");
+    startLoad(options());
+}
+
+DaemonOptions LoadTest::options() const {
     DaemonOptions options;
     options.output = DaemonOptions::Output::discarded;
     options.environment["QNS_HV_DATA"] = mFolder.path("data");
+    return options;
+}
+
+void LoadTest::startLoad(const DaemonOptions& options) {
+    const unsigned number = seed();
+    std::printf("QNS_LOAD_SEED=%u\n", number);
+    mSyslog.keepOnly("onSystemSingleCaught");
+    mLoad.reset();
     start(options);
     mLoad.emplace(mFolder.path(""), number);
     mLoad->begin();
@@ -67,7 +76,8 @@ void LoadTest::endDuringLoad(std::chrono::milliseconds after) {
     mLoad->runInto(
         [this] {
             const auto start = patience::Clock::now();
-            EXPECT_EQ(mpDaemon->terminate(), 0);
+            mpDaemon->signal(SIGTERM);
+            EXPECT_EQ(mpDaemon->waitForEnd(), 0);
             const auto needed = patience::Clock::now() - start;
             EXPECT_TRUE(!kSignalsComeAtOnce || needed < patience::stretched(1s));
         },

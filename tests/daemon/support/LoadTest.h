@@ -6,6 +6,7 @@
 
 #include "tests/daemon/support/DaemonTest.h"
 #include "tests/daemon/support/Load.h"
+#include "tests/engine/Mount.h"
 #include "tests/support/TestFolder.h"
 
 /**
@@ -14,7 +15,14 @@
  */
 class LoadTest : public DaemonTest {
 protected:
+    /** Starts daemon and load. */
     void SetUp() override;
+
+    /** Options of the daemon that SetUp() starts. */
+    [[nodiscard]] DaemonOptions options() const;
+
+    /** Starts a daemon, and a load that is new to it. */
+    void startLoad(const DaemonOptions& options);
 
     /** What the daemon holds while nothing is played. */
     struct Holdings {
@@ -34,5 +42,7 @@ protected:
     void endDuringLoad(std::chrono::milliseconds after);
 
     TestFolder mFolder;
+    /** In memory: a process that is ended waits until the disk has what it was writing. */
+    Mount mLibrary = Mount::memory(mFolder.path("data"), 256'000'000);
     std::optional<load::Load> mLoad;
 };

@@ -58,6 +58,14 @@ qns::UniqueFd listenOn(long port) {
     return socket;
 }
 
+qns::UniqueFd startConnecting(long port) {
+    auto socket = qns::UniqueFd(::socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC | SOCK_NONBLOCK, 0));
+    const auto address = loopback(port);
+    static_cast<void>(
+        ::connect(socket.get(), reinterpret_cast<const sockaddr*>(&address), sizeof(address)));
+    return socket;
+}
+
 qns::UniqueFd connectToDaemon(int receiveBuffer) {
     const auto deadline = patience::deadline();
     do {

@@ -16,6 +16,9 @@ constexpr long kDaemonPort = 1008;
 /** A socket that listens on 127.0.0.1. Fails the test when the port is taken. */
 qns::UniqueFd listenOn(long port);
 
+/** A connection to the port on 127.0.0.1 that need not come about; nobody waits for it. */
+qns::UniqueFd startConnecting(long port);
+
 /** A connection to the daemon, as soon as it listens. A positive `receiveBuffer` is set before. */
 qns::UniqueFd connectToDaemon(int receiveBuffer = 0);
 
