@@ -6,7 +6,6 @@
 #include "gst/Library.h"
 #include "handle/Barrier.h"
 #include "player/Session.h"
-#include "worker/Pool.h"
 
 namespace engine {
 
@@ -46,7 +45,6 @@ std::deque<Item> Engine::abandon() {
 
 void Engine::run() {
     gst::initialise();
-    worker::Pool::shared().warm();
     while (!mQuit) {
         const TimePoint deadline = mpSession ? mpSession->deadline() : kNever;
         handle::guarded([&] {

@@ -69,10 +69,6 @@ Pool& Pool::shared() {
     return pool;
 }
 
-void Pool::warm() {
-    giveBack(take());
-}
-
 int Pool::ask(const Question& question, const Listener& listen) {
     auto process = take();
     if (!process)

@@ -36,9 +36,6 @@ public:
     /** The one that serves who asks for somebody who waits. */
     static Pool& shared();
 
-    /** Starts a worker, if there is none, so that the first question need not wait for it. */
-    void warm();
-
     struct Question {
         Request request;
         std::vector<int> files; ///< what the request is about
