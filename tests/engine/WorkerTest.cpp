@@ -7,7 +7,9 @@
 #include <csignal>
 #include <filesystem>
 #include <fstream>
+#include <mutex>
 #include <sched.h>
+#include <set>
 #include <sys/wait.h>
 #include <thread>
 
@@ -193,6 +195,25 @@ TEST_F(Worker, AFileThatEndsItCostsNobodyElse) {
     for (std::thread& thread : threads)
         thread.join();
     EXPECT_EQ(wrong, 0);
+}
+
+TEST_F(Worker, IsSharedByWhoeverAsks) {
+    std::atomic<int> read{0};
+    std::mutex mutex;
+    std::set<pid_t> workers;
+    std::vector<std::thread> threads;
+    for (int number = 0; number < 10; ++number)
+        threads.emplace_back([&] {
+            for (int turn = 0; turn < 20; ++turn)
+                read += describe(samplePath("film.mp4")) == kOk ? 1 : 0;
+            const pid_t worker = idleWorker(mPool);
+            const std::lock_guard lock(mutex);
+            workers.insert(worker);
+        });
+    for (std::thread& thread : threads)
+        thread.join();
+    EXPECT_EQ(read, 200);
+    EXPECT_LE(workers.size(), static_cast<std::size_t>(Pool::kMost));
 }
 
 TEST(WorkerProgram, RefusesToBeStartedByHand) {

@@ -11,6 +11,7 @@
 #include <utility>
 
 #include "LibMediaPlayer/Result.h"
+#include "handle/Barrier.h"
 #include "qnsys.h"
 #include "worker/Message.h"
 #include "worker/Server.h"
@@ -20,8 +21,6 @@ namespace worker {
 using namespace LibMediaPlayer;
 
 namespace {
-
-constexpr std::size_t kMostIdle = 2;
 
 /** What a question comes to whose worker is lost. */
 struct Loss {
@@ -70,6 +69,30 @@ Pool& Pool::shared() {
 }
 
 int Pool::ask(const Question& question, const Listener& listen) {
+    if (!reserve(question.patience.start))
+        return kTimedOut;
+    const int result =
+        handle::guarded(static_cast<int>(kInternal), [&] { return askReserved(question, listen); });
+    release();
+    return result;
+}
+
+/** False when all workers are busy for so long. */
+bool Pool::reserve(std::chrono::milliseconds time) {
+    std::unique_lock lock(mMutex);
+    if (!mReleased.wait_for(lock, time, [this] { return mReserved < kMost; }))
+        return false;
+    ++mReserved;
+    return true;
+}
+
+void Pool::release() {
+    const std::lock_guard lock(mMutex);
+    --mReserved;
+    mReleased.notify_one();
+}
+
+int Pool::askReserved(const Question& question, const Listener& listen) {
     auto process = take();
     if (!process)
         return kNotAvailable;
@@ -137,7 +160,7 @@ std::unique_ptr<Process> Pool::start() const {
 
 void Pool::giveBack(std::unique_ptr<Process> process) {
     const std::lock_guard lock(mMutex);
-    if (process && mIdle.size() < kMostIdle)
+    if (process)
         mIdle.push_back(std::move(process));
 }
 

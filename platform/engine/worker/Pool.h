@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <chrono>
+#include <condition_variable>
 #include <functional>
 #include <memory>
 #include <mutex>
@@ -26,10 +28,13 @@ enum class Haste {
 
 /**
  * Worker processes, so that a file that crashes, hangs or swells what reads it costs the question
- * about that file and nothing else. As many run as are asked at once; two of them stay. Any thread.
+ * about that file and nothing else. As many run as are asked at once, at most kMost. Any thread.
  */
 class Pool {
 public:
+    /** As many as the engine has threads that ask: its caller's, the player's, the importer's. */
+    static constexpr int kMost = 3;
+
     explicit Pool(std::string program = defaultProgram(), Haste haste = Haste::kNormal)
         : mProgram(std::move(program)), mHaste(haste) {}
 
@@ -54,6 +59,9 @@ public:
     void cancel();
 
 private:
+    bool reserve(std::chrono::milliseconds time);
+    void release();
+    int askReserved(const Question& question, const Listener& listen);
     std::unique_ptr<Process> take();
     std::unique_ptr<Process> takeIdle();
     std::unique_ptr<Process> start() const;
@@ -67,6 +75,8 @@ private:
     std::mutex mMutex; ///< guards what follows
     std::vector<std::unique_ptr<Process>> mIdle;
     std::vector<Process*> mBusy;
+    int mReserved = 0; ///< questions that have a worker, or may start one
+    std::condition_variable mReleased;
     bool mCancelled = false;
 };
 
