@@ -10,6 +10,7 @@
 #include <mutex>
 #include <sched.h>
 #include <set>
+#include <sys/stat.h>
 #include <sys/wait.h>
 #include <thread>
 
@@ -181,6 +182,20 @@ TEST_F(Worker, ThatCannotBeStartedIsNotAvailable) {
     }
 }
 
+TEST_F(Worker, ThatStartsSlowlyServesTheQuestionAfterTheOneThatIsTooEarly) {
+    const std::string gate = mFolder.path("gate");
+    const std::string program = mFolder.path("slow-worker");
+    ASSERT_EQ(::mkfifo(gate.c_str(), 0600), 0);
+    std::ofstream(program) << "#!/bin/sh\nread word <'" << gate
+                           << "'\nexec " QNS_HOSTILE_WORKER "\n";
+    fs::permissions(program, fs::perms::owner_all);
+    Pool pool(program);
+    EXPECT_EQ(worker::draw(samplePath("film.mp4"), {0, 8, 8, {}}, 1, pool), kTimedOut);
+    std::ofstream(gate) << "go\n";
+    Details details;
+    EXPECT_EQ(describe(samplePath("film.mp4"), details, pool), kOk);
+}
+
 TEST_F(Worker, AFileThatEndsItCostsNobodyElse) {
     const std::string crash = hostile("crash");
     std::atomic<int> wrong{0};
@@ -198,6 +213,7 @@ TEST_F(Worker, AFileThatEndsItCostsNobodyElse) {
 }
 
 TEST_F(Worker, IsSharedByWhoeverAsks) {
+    const std::string count = hostile("count");
     std::atomic<int> read{0};
     std::mutex mutex;
     std::set<pid_t> workers;
@@ -206,7 +222,9 @@ TEST_F(Worker, IsSharedByWhoeverAsks) {
         threads.emplace_back([&] {
             for (int turn = 0; turn < 20; ++turn)
                 read += describe(samplePath("film.mp4")) == kOk ? 1 : 0;
-            const pid_t worker = idleWorker(mPool);
+            Details details;
+            EXPECT_EQ(describe(count, details, mPool), kOk);
+            const pid_t worker = std::stoi(details.info.system.mediaType);
             const std::lock_guard lock(mutex);
             workers.insert(worker);
         });

@@ -14,12 +14,19 @@ using namespace std::chrono_literals;
 
 namespace {
 
+/** Sanitizers make the start of a program take many times as long. */
+#ifdef QNS_SANITIZED
+constexpr int kStartFactor = 5;
+#else
+constexpr int kStartFactor = 1;
+#endif
+
 /**
  * Half a second more than the worker allows itself, so that only one that hangs is too late. With
  * the time to start one an answer comes within five seconds.
  */
-constexpr Process::Patience kLookPatience{2700ms, 2000ms};
-constexpr Process::Patience kDrawPatience{700ms, 4000ms};
+constexpr Process::Patience kLookPatience{kStartFactor * 2700ms, 2000ms};
+constexpr Process::Patience kDrawPatience{kStartFactor * 700ms, 4000ms};
 
 /** Nobody waits for a thumbnail, and its worker runs only when nothing else does. */
 constexpr Process::Patience kThumbnailPatience{10s, 10s};

@@ -36,6 +36,7 @@ Loss lossOf(Process::Outcome outcome) {
         return {kTimedOut, "took too long"};
     case Process::Outcome::kAnswered:
         return {kInternal, "said what cannot be"};
+    case Process::Outcome::kStarting:
     case Process::Outcome::kEnded:
         break;
     }
@@ -99,6 +100,11 @@ int Pool::askReserved(const Question& question, const Listener& listen) {
     const Process::Answer answer = askBusy(*process, question);
     if (isCancelled())
         return kCancelled;
+    if (answer.outcome == Process::Outcome::kStarting) {
+        // On a device that is so slow the next question finds it ready.
+        giveBack(std::move(process));
+        return kTimedOut;
+    }
     if (answer.outcome != Process::Outcome::kAnswered || !listen(answer.bytes))
         return lose(std::move(process), answer.outcome, question.name);
     giveBack(std::move(process));

@@ -96,8 +96,8 @@ Process::~Process() {
 
 Process::Answer Process::ask(std::string_view request, const std::vector<int>& files,
                              Patience patience) {
-    if (!awaitReady(patience.start))
-        return {Outcome::kNotStarted, {}};
+    if (const Outcome outcome = awaitReady(patience.start); outcome != Outcome::kAnswered)
+        return {outcome, {}};
     const auto deadline = steady_clock::now() + patience.answer;
     if (!send(mSocket.get(), request, files))
         return {Outcome::kEnded, {}};
@@ -110,11 +110,13 @@ Process::Answer Process::ask(std::string_view request, const std::vector<int>& f
 }
 
 /** Its first message says that it has begun, and has given up its rights. */
-bool Process::awaitReady(std::chrono::milliseconds time) {
-    if (!mReady)
-        mReady = awaitParcel(mSocket.get(), steady_clock::now() + time) &&
-                 receive(mSocket.get()).has_value();
-    return mReady;
+Process::Outcome Process::awaitReady(std::chrono::milliseconds time) {
+    if (mReady)
+        return Outcome::kAnswered;
+    if (!awaitParcel(mSocket.get(), steady_clock::now() + time))
+        return Outcome::kStarting;
+    mReady = receive(mSocket.get()).has_value();
+    return mReady ? Outcome::kAnswered : Outcome::kNotStarted;
 }
 
 void Process::hangUp() const {

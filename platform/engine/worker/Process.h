@@ -17,7 +17,8 @@ class Process {
 public:
     enum class Outcome {
         kAnswered,
-        kNotStarted, ///< it never was ready
+        kStarting,   ///< it is not ready yet
+        kNotStarted, ///< it never was ready, and has ended
         kEnded,
         kTimedOut
     };
@@ -57,7 +58,7 @@ public:
 
 private:
     Process(pid_t pid, qns::UniqueFd socket);
-    bool awaitReady(std::chrono::milliseconds time);
+    Outcome awaitReady(std::chrono::milliseconds time);
 
     pid_t mPid;
     qns::UniqueFd mSocket;
