@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include "tests/engine/CpuWait.h"
 
-#include <algorithm>
 #include <filesystem>
 #include <fstream>
 
@@ -16,17 +15,22 @@ Seconds waitOfThread(const std::filesystem::path& folder) {
     return std::chrono::nanoseconds(waiting);
 }
 
-Seconds waitOfProcess() {
-    Seconds sum{};
+std::map<std::string, Seconds> waitOfThreads() {
+    std::map<std::string, Seconds> waits;
     for (const auto& thread : std::filesystem::directory_iterator("/proc/self/task"))
-        sum += waitOfThread(thread.path());
-    return sum;
+        waits[thread.path().filename()] = waitOfThread(thread.path());
+    return waits;
 }
 
 } // namespace
 
-CpuWait::CpuWait() : mBefore(waitOfProcess()) {}
+CpuWait::CpuWait() : mBefore(waitOfThreads()) {}
 
 Seconds CpuWait::elapsed() const {
-    return std::max(Seconds{}, waitOfProcess() - mBefore);
+    Seconds sum{};
+    for (const auto& [thread, wait] : waitOfThreads()) {
+        const auto before = mBefore.find(thread);
+        sum += before == mBefore.end() ? wait : wait - before->second;
+    }
+    return sum;
 }

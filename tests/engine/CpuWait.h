@@ -1,6 +1,9 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <map>
+#include <string>
+
 #include "tests/engine/TestPlayer.h"
 
 /**
@@ -11,9 +14,9 @@ class CpuWait {
 public:
     CpuWait();
 
-    /** Of all threads together; of those that have ended, nothing. Never negative. */
+    /** Of all threads that live now, together. */
     [[nodiscard]] Seconds elapsed() const;
 
 private:
-    Seconds mBefore;
+    std::map<std::string, Seconds> mBefore; ///< by thread
 };
