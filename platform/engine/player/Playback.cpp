@@ -17,6 +17,9 @@ constexpr std::chrono::seconds kSeekTime{5};
 /** Rounds of a very short loop that are on their way at a time; the timeline holds more. */
 constexpr std::size_t kMostJoins = 4;
 
+/** While one of these plays, the next can be read. */
+constexpr std::chrono::milliseconds kLongRound{200};
+
 } // namespace
 
 void Playback::attach(Pipeline* pipeline) {
@@ -325,7 +328,9 @@ void Playback::fitLoop() {
 }
 
 void Playback::joinLoop() {
-    mJoinHeld = mJoins + mJoints.size() >= kMostJoins;
+    // Asking for a round can wait for the one that is being read, and a return would be told late.
+    const Nanoseconds round = mLoop->end.value_or(mMedium.duration) - mLoop->start;
+    mJoinHeld = mJoins + mJoints.size() >= (round < kLongRound ? kMostJoins : 1);
     if (mJoinHeld)
         return;
     ++mJoins;
