@@ -3,7 +3,6 @@
 // a decoder would have it do.
 #include <array>
 #include <cerrno>
-#include <clocale>
 #include <csignal>
 #include <fcntl.h>
 #include <memory>
@@ -16,9 +15,8 @@
 #include "LibMediaPlayer/Result.h"
 #include "discoverer/Details.h"
 #include "worker/Answers.h"
-#include "worker/Idleness.h"
 #include "worker/Message.h"
-#include "worker/Sandbox.h"
+#include "worker/Program.h"
 
 namespace {
 
@@ -131,10 +129,5 @@ std::string answer(worker::Request& request, Files files) {
 } // namespace
 
 int main(int argc, char** argv) {
-    if (argc > 1 && std::string_view(argv[1]) == worker::kIdleOption)
-        worker::runWhenIdle();
-    std::setlocale(LC_ALL, "");
-    worker::enterSandbox();
-    worker::serve(worker::kServerSocket, answer);
-    return 0;
+    return worker::run(argc, argv, answer);
 }

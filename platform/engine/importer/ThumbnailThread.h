@@ -14,12 +14,13 @@
 
 namespace importer {
 
-/** Draws a thumbnail of a file, in a bounded time whatever the file; kCancelled: did not want to.
+/**
+ * Draws a thumbnail of a file, in a bounded time whatever the file. The result kCancelled means
+ * that it was not tried to the end, and costs no try.
  */
 using DrawThumbnail = std::function<discoverer::Thumbnail(const std::string& path)>;
 
-/** What a thumbnail is drawn for, and what came of it; nothing when it was not begun or finished.
- */
+/** What a thumbnail is drawn for, and what came of it; nothing when it was not tried to the end. */
 struct Drawn {
     library::MissingThumbnail missing;
     std::optional<discoverer::Thumbnail> thumbnail;

@@ -16,8 +16,7 @@
 
 namespace worker {
 
-/** The workers' program: what QNS_MEDIA_WORKER names, else qnsmedia/media-worker beside the
- * library. */
+/** What QNS_MEDIA_WORKER names, else qnsmedia/media-worker beside the library. */
 std::string defaultProgram();
 
 /** When workers run. */
