@@ -149,16 +149,17 @@ long Link::await(const Request& request, Completion completion) {
 }
 
 PendingRequests::Added Link::add(const Request& request, Completion completion) {
+    const auto deadline = Clock::now() + mDeadline + request.extraTime;
     PendingRequest pending;
     pending.object = request.replyObject;
     pending.method = request.replyMethod;
     pending.answers = request.answers;
-    pending.deadline = Clock::now() + mDeadline + request.extraTime;
+    pending.deadline = deadline;
     pending.what = request.what;
     pending.completion = std::move(completion);
     const auto added = mPending.add(pending);
     if (added.ticket != 0)
-        wakeWatcher();
+        wakeWatcherBefore(deadline);
     else
         fail(request.replyObject, std::move(pending.completion), lost(request.what));
     return added;
@@ -207,6 +208,12 @@ void Link::wakeWatcher() {
     ::eventfd_write(mWakeUp.get(), 1);
 }
 
+/** Most deadlines are later than one that it waits for already, and cost nothing. */
+void Link::wakeWatcherBefore(Clock::time_point deadline) {
+    if (deadline < mWatcherWakes.load())
+        wakeWatcher();
+}
+
 void Link::watch() {
     while (!mStopping) {
         pollfd watched[] = {{mWakeUp.get(), POLLIN, 0},
@@ -223,9 +230,12 @@ void Link::watch() {
 }
 
 int Link::millisecondsToNextDeadline() {
+    // First: a request that comes while the next one is looked for wakes in any case.
+    mWatcherWakes = Clock::time_point::max();
     const std::optional<Clock::time_point> next = mPending.nextDeadline();
     if (!next)
         return -1;
+    mWatcherWakes = *next;
     const auto left = std::chrono::ceil<milliseconds>(*next - Clock::now());
     return static_cast<int>(std::clamp<long>(left.count(), 0, 60'000));
 }

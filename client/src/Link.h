@@ -95,6 +95,7 @@ private:
 
     void watch();
     void wakeWatcher();
+    void wakeWatcherBefore(Clock::time_point deadline);
     int millisecondsToNextDeadline();
     void expireRequests();
     void lose();
@@ -118,6 +119,7 @@ private:
     std::atomic<bool> mLost{false};
     std::atomic<bool> mStopping{false};
     qns::UniqueFd mWakeUp;
+    std::atomic<Clock::time_point> mWatcherWakes{Clock::time_point::max()}; ///< by itself
 
     std::mutex mMutex; ///< guards the handlers, and the order of loss and of mLostHandler
     std::function<void()> mLostHandler;
