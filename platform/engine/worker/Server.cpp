@@ -24,7 +24,7 @@ std::string refusal(int result) {
     return message.bytes();
 }
 
-std::string answerTo(Parcel parcel, const Answerer& answer) {
+std::string answerTo(Parcel& parcel, const Answerer& answer) {
     Request request;
     MessageReader message(parcel.bytes);
     message(request);
@@ -50,7 +50,7 @@ void serve(int socket, const Answerer& answer) {
         if (!parcel)
             return;
         ::alarm(kLongestSeconds);
-        isHeard = send(socket, answerTo(*std::move(parcel), answer));
+        isHeard = send(socket, answerTo(*parcel, answer));
         ::alarm(0);
     }
 }
