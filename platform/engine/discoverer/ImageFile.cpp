@@ -13,6 +13,7 @@
 
 #include "LibMediaPlayer/Result.h"
 #include "base/UniqueFd.h"
+#include "handle/SystemResult.h"
 
 namespace discoverer {
 
@@ -31,24 +32,6 @@ bool endsWith(const std::string& path, std::string_view ending) {
                       [&](char expected, char given) { return isSame(given, expected); });
 }
 
-int resultOfErrno(int error) {
-    switch (error) {
-    case ENOENT:
-    case ENOTDIR:
-        return kNotFound;
-    case ENOSPC:
-    case EDQUOT:
-        return kNoSpace;
-    case EACCES:
-    case EPERM:
-    case EROFS:
-    case EISDIR:
-        return kAccessDenied;
-    default:
-        return kNotAvailable;
-    }
-}
-
 /** A file that has another name until it is whole. */
 class WholeFile {
 public:
@@ -57,7 +40,7 @@ public:
           mTemporary(path + ".part-" + std::to_string(::getpid()) + "-" +
                      std::to_string(++gNumber)),
           mFile(::open(mTemporary.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0666)) {
-        mResult = mFile ? kOk : resultOfErrno(errno);
+        mResult = mFile ? kOk : handle::resultOfErrno(errno);
     }
     ~WholeFile() {
         if (mFile)
@@ -73,14 +56,14 @@ public:
         while (mResult == kOk && count > 0) {
             count = ::sendfile(mFile.get(), content, &place, kLargestStep);
             if (count < 0 && errno != EINTR)
-                mResult = resultOfErrno(errno);
+                mResult = handle::resultOfErrno(errno);
         }
     }
 
     /** Gives it its name. */
     int finish() {
         if (mResult == kOk && ::rename(mTemporary.c_str(), mPath.c_str()) != 0)
-            mResult = resultOfErrno(errno);
+            mResult = handle::resultOfErrno(errno);
         if (mResult == kOk)
             mFile.reset();
         return mResult;

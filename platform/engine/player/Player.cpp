@@ -8,6 +8,7 @@
 #include <utility>
 
 #include "LibMediaPlayer/Result.h"
+#include "handle/SystemResult.h"
 #include "player/Failure.h"
 #include "player/Reporter.h"
 #include "text/Text.h"
@@ -20,23 +21,6 @@ namespace {
 
 /** A device's clock drifts from ours; compare them when somebody looks and the last is so old. */
 constexpr std::chrono::seconds kAnchorAge{1};
-
-int resultOfErrno(int error) {
-    switch (error) {
-    case ENOENT:
-    case ENOTDIR:
-        return kNotFound;
-    case ENOSPC:
-        return kNoSpace;
-    case EACCES:
-    case EPERM:
-    case EROFS:
-    case EISDIR:
-        return kAccessDenied;
-    default:
-        return kNotAvailable;
-    }
-}
 
 /** Brings the ends inside the medium; false when nothing is between them. */
 bool fitLoop(RepeatParam& param, Nanoseconds duration) {
@@ -127,7 +111,7 @@ int Player::dumpGraph(const std::wstring& path) {
     qns::UniqueFd file(
         ::open(toBytes(path).c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC | O_NONBLOCK, 0666));
     if (!file)
-        return resultOfErrno(errno);
+        return handle::resultOfErrno(errno);
     post(DumpOrder{std::move(file)});
     return kOk;
 }

@@ -7,38 +7,20 @@
 #include <utility>
 
 #include "LibMediaPlayer/Result.h"
+#include "handle/SystemResult.h"
 
 namespace probe {
 
 using namespace LibMediaPlayer;
 
-namespace {
-
-int resultOfErrno(int error) {
-    switch (error) {
-    case EACCES:
-    case EPERM:
-        return kAccessDenied;
-    case ENOENT:
-    case ENOTDIR:
-    case ENAMETOOLONG:
-    case ELOOP:
-        return kNotFound;
-    default:
-        return kNotAvailable;
-    }
-}
-
-} // namespace
-
 int RegularFile::open(const std::string& path) {
     struct stat status {};
     if (::stat(path.c_str(), &status) != 0)
-        return resultOfErrno(errno);
+        return handle::resultOfErrno(errno);
     if (!S_ISREG(status.st_mode))
         return kNotMedia;
     qns::UniqueFd opened(::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK | O_NOCTTY));
-    return opened ? adopt(std::move(opened)) : resultOfErrno(errno);
+    return opened ? adopt(std::move(opened)) : handle::resultOfErrno(errno);
 }
 
 int RegularFile::adopt(qns::UniqueFd opened) {
