@@ -30,7 +30,7 @@ TEST_F(LongLoad, TakesNoMoreOfAnythingAfterItsFirstTenth) {
 }
 
 TEST_F(LongLoad, BesideTwoHundredStrangersLeavesNothingBehind) {
-    run(kTenth); // until the engine has all the workers it ever needs
+    run(kTenth / 6);
     const auto before = holdings();
     {
         const Strangers strangers(200, 100);

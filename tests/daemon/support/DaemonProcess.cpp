@@ -123,6 +123,18 @@ std::size_t entries(pid_t pid, const char* folder) {
     return static_cast<std::size_t>(std::distance(begin(all), end(all)));
 }
 
+std::size_t children(pid_t pid) {
+    std::size_t count = 0;
+    std::error_code error;
+    const std::string threads = "/proc/" + std::to_string(pid) + "/task";
+    for (const auto& thread : std::filesystem::directory_iterator(threads, error)) {
+        std::ifstream ids(thread.path() / "children");
+        count += static_cast<std::size_t>(
+            std::distance(std::istream_iterator<pid_t>(ids), std::istream_iterator<pid_t>()));
+    }
+    return count;
+}
+
 int shellStatus(int status) {
     return WIFSIGNALED(status) ? 128 + WTERMSIG(status) : WEXITSTATUS(status);
 }
@@ -240,7 +252,7 @@ bool DaemonProcess::isRunning() {
 }
 
 std::size_t DaemonProcess::descriptorCount() const {
-    return entries(mPid, "fd");
+    return entries(mPid, "fd") - children(mPid);
 }
 
 std::size_t DaemonProcess::threadCount() const {

@@ -83,8 +83,13 @@ public:
 
     [[nodiscard]] bool isRunning();
 
-    /** Open descriptors and threads at this moment. */
+    /**
+     * Open descriptors at this moment, but for those of the engine's worker processes: each has
+     * one, and is started when it is first needed.
+     */
     [[nodiscard]] std::size_t descriptorCount() const;
+
+    /** Threads at this moment. */
     [[nodiscard]] std::size_t threadCount() const;
 
     /** Bytes of memory in use at this moment. */
