@@ -1,13 +1,14 @@
 // SPDX-License-Identifier: MIT
 #include "importer/Graph.h"
 
+#include <cerrno>
 #include <cstdio>
 #include <fcntl.h>
 #include <unistd.h>
 
 #include "LibMediaPlayer/Result.h"
 #include "base/UniqueFd.h"
-#include "importer/Failure.h"
+#include "handle/SystemResult.h"
 
 namespace importer {
 
@@ -33,13 +34,13 @@ int writeGraph(const std::string& path, const JobQueue& queue) {
     const qns::UniqueFd file(
         ::open(path.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC | O_NONBLOCK, 0666));
     if (!file)
-        return systemFailure("", path).result();
+        return handle::resultOfErrno(errno);
     MediaImporterStatus bytes;
     const ImporterState state = queue.status(bytes);
     const int written =
         ::dprintf(file.get(), kFormat, queue.waitingCount(), kStateNames[state],
                   static_cast<long long>(bytes.done), static_cast<long long>(bytes.total));
-    return written > 0 ? kOk : systemFailure("", path).result();
+    return written > 0 ? kOk : handle::resultOfErrno(errno);
 }
 
 } // namespace importer
